@@ -1,0 +1,27 @@
+# Warnings, hardening and sanitizers, said once for every target of the project.
+
+add_compile_options(
+    -Wall -Wextra -Wpedantic -Wshadow -Wconversion -Wsign-conversion -Wformat=2 -Wundef
+    -Wcast-align -Wnull-dereference
+    $<$<COMPILE_LANGUAGE:CXX>:-Wold-style-cast>
+    $<$<COMPILE_LANGUAGE:CXX>:-Wnon-virtual-dtor>
+    $<$<COMPILE_LANGUAGE:CXX>:-Woverloaded-virtual>
+    $<$<COMPILE_LANGUAGE:CXX>:-Wextra-semi>)
+if(VANTOR_WERROR)
+    add_compile_options(-Werror)
+endif()
+
+add_compile_options(-fstack-protector-strong)
+add_link_options(-Wl,-z,relro -Wl,-z,now)
+
+if(VANTOR_SANITIZERS)
+    add_compile_options(
+        -fsanitize=${VANTOR_SANITIZERS} -fno-sanitize-recover=all -fno-omit-frame-pointer)
+    add_link_options(-fsanitize=${VANTOR_SANITIZERS})
+else()
+    # Fortified calls bypass the sanitizers' interceptors, so they are for the hardened builds only.
+    add_compile_options($<$<NOT:$<CONFIG:Debug>>:-D_FORTIFY_SOURCE=2>)
+endif()
+
+include(CheckPIESupported)
+check_pie_supported()

@@ -1,0 +1,132 @@
+#include "graph/Executor.h"
+
+#include <cstdlib>
+#include <iterator>
+#include <memory>
+#include <string>
+
+#include "graph/GlobalLock.h"
+#include "graph/Node.h"
+#include "plugins/Exceptions.h"
+
+namespace vantor {
+
+namespace {
+
+// What a worker is started with; the worker frees it.
+struct WorkerStart {
+    Executor* executor;
+    std::int32_t index;
+};
+
+}  // namespace
+
+Executor::Executor(std::int32_t threadCount, bool randomizeEquals)
+    : randomize(randomizeEquals) {
+    if (pthread_cond_init(&workAvailable, nullptr) != 0) {
+        throw Exception("Condition variable for Executor could not be initialized");
+    }
+    try {
+        StartWorkers(threadCount);
+    } catch (...) {
+        StopWorkers();
+        pthread_cond_destroy(&workAvailable);
+        throw;
+    }
+}
+
+Executor::~Executor() {
+    StopWorkers();
+    pthread_cond_destroy(&workAvailable);
+}
+
+void Executor::StartWorkers(std::int32_t threadCount) {
+    if (threadCount < 1) {
+        return;
+    }
+    threads.reserve(static_cast<std::size_t>(threadCount));
+    for (std::int32_t index = 0; index < threadCount; ++index) {
+        auto start = std::make_unique<WorkerStart>(WorkerStart{this, index});
+        pthread_t thread{};
+        if (pthread_create(&thread, nullptr, &Executor::WorkerEntry, start.get()) != 0) {
+            throw Exception("Could not create enough execution threads. (" +
+                            std::to_string(threads.size()) + " created, " +
+                            std::to_string(threadCount) + "requested)");
+        }
+        start.release();  // NOLINT(bugprone-unused-return-value): the worker owns it now
+        threads.push_back(thread);
+    }
+}
+
+// The lock is free while joining: a worker that sleeps on `workAvailable` must take it to leave.
+void Executor::StopWorkers() {
+    GlobalLockGuard guard;
+    stopping = true;
+    GlobalLock::Broadcast(workAvailable);
+    guard.Release();
+    for (const pthread_t thread : threads) {
+        pthread_join(thread, nullptr);
+    }
+    threads.clear();
+}
+
+void Executor::Enqueue(Node& node) {
+    const GlobalLockGuard guard;
+    queue.push_back(&node);
+    GlobalLock::Broadcast(workAvailable);
+}
+
+std::size_t Executor::PickNext() const {
+    std::int32_t best = 0;
+    std::vector<std::size_t> candidates;
+    std::size_t position = 0;
+    for (Node* node : queue) {
+        const std::int32_t height = node->Height();
+        if (height > best) {
+            candidates.clear();
+            best = height;
+        }
+        if (height == best) {
+            candidates.push_back(position);
+        }
+        ++position;
+    }
+    if (!randomize) {
+        return candidates.front();
+    }
+    const auto draw = static_cast<std::size_t>(std::rand());
+    return candidates[draw % candidates.size()];
+}
+
+Node& Executor::TakeNext() {
+    const auto chosen = std::next(queue.begin(), static_cast<std::ptrdiff_t>(PickNext()));
+    Node& node = **chosen;
+    queue.erase(chosen);
+    return node;
+}
+
+void* Executor::WorkerEntry(void* argument) {
+    {
+        const std::unique_ptr<WorkerStart> start(static_cast<WorkerStart*>(argument));
+        start->executor->RunWorker();
+    }
+    pthread_exit(nullptr);
+}
+
+void Executor::RunWorker() {
+    GlobalLockGuard guard;
+    while (!stopping) {
+        while (!queue.empty()) {
+            Node& node = TakeNext();
+            guard.Release();
+            node.Execute(*this);
+            guard.Retake();
+            if (stopping) {
+                return;
+            }
+        }
+        GlobalLock::Wait(workAvailable);
+    }
+}
+
+}  // namespace vantor

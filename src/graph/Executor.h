@@ -1,0 +1,61 @@
+#ifndef VANTOR_GRAPH_EXECUTOR_H
+#define VANTOR_GRAPH_EXECUTOR_H
+
+#include <pthread.h>
+
+#include <cstddef>
+#include <cstdint>
+#include <list>
+#include <vector>
+
+namespace vantor {
+
+class Node;
+
+// Runs the dependency graph on a fixed pool of threads. Of the ready nodes the one with the longest
+// chain of work below it (its height) goes first, so that the critical path starts early; among
+// equals the one that has been ready longest, or a random one. One worker gives serial order.
+//
+// A run: construct the executor, Node::Schedule() every plugin in load order, Node::WaitDone() for
+// each in the same order, destroy the executor. The ready queue and the stop flag are guarded by
+// GlobalLock; `threads` belongs to the thread that constructs and destroys the executor.
+class Executor {
+public:
+    // Starts `threadCount` workers; none when it is below 1, and then no node is ever run. With
+    // `randomizeEquals`, equals are drawn by rand(), which nothing seeds: every run draws the same. Throws
+    // Exception, with no worker left behind, when the pool cannot be built whole.
+    Executor(std::int32_t threadCount, bool randomizeEquals);
+
+    Executor(const Executor&) = delete;
+    Executor& operator=(const Executor&) = delete;
+
+    // Lets every worker finish the node that it runs, and joins it. Nodes still in the queue are
+    // never run.
+    virtual ~Executor();
+
+    // Puts a node that has become ready at the end of the queue and wakes the workers. Takes
+    // GlobalLock. Only for Node::Schedule(), which has set the node's state; the node must outlive
+    // the executor.
+    void Enqueue(Node& node);
+
+    // The position in the queue, counted from 0, of the node to run next. The caller holds
+    // GlobalLock, and the queue is not empty.
+    std::size_t PickNext() const;
+
+private:
+    static void* WorkerEntry(void* argument);
+    void RunWorker();
+    void StartWorkers(std::int32_t threadCount);
+    void StopWorkers();
+    Node& TakeNext();
+
+    pthread_cond_t workAvailable;  // broadcast when a node is queued and when the pool stops
+    std::list<Node*> queue;        // ready nodes, longest ready first
+    std::vector<pthread_t> threads;
+    bool stopping = false;
+    bool randomize;
+};
+
+}  // namespace vantor
+
+#endif

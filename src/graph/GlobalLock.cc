@@ -1,0 +1,56 @@
+#include "graph/GlobalLock.h"
+
+namespace vantor {
+
+pthread_mutex_t GlobalLock::mutex = PTHREAD_RECURSIVE_MUTEX_INITIALIZER_NP;
+std::atomic<std::int32_t> GlobalLock::holdCount{0};
+std::atomic<pthread_t> GlobalLock::holder{};
+
+void GlobalLock::Lock() {
+    pthread_mutex_lock(&mutex);
+    RecordHolder(holdCount.load(std::memory_order_relaxed) + 1);
+}
+
+void GlobalLock::Unlock() {
+    holdCount.store(holdCount.load(std::memory_order_relaxed) - 1, std::memory_order_release);
+    pthread_mutex_unlock(&mutex);
+}
+
+void GlobalLock::Wait(pthread_cond_t& condition) {
+    holdCount.store(0, std::memory_order_release);
+    pthread_cond_wait(&condition, &mutex);
+    RecordHolder(1);
+}
+
+void GlobalLock::Broadcast(pthread_cond_t& condition) { pthread_cond_broadcast(&condition); }
+
+// The counter says that some thread holds the lock before the holder says which only if the holder
+// was stored first: the other way round, a former holder could read the new count beside its own
+// old name and believe that the lock is its own.
+void GlobalLock::RecordHolder(std::int32_t count) {
+    holder.store(pthread_self(), std::memory_order_relaxed);
+    holdCount.store(count, std::memory_order_release);
+}
+
+bool GlobalLock::HeldByCurrentThread() {
+    return holdCount.load(std::memory_order_acquire) >= 1 &&
+           pthread_equal(holder.load(std::memory_order_relaxed), pthread_self()) != 0;
+}
+
+GlobalLockGuard::~GlobalLockGuard() {
+    if (held) {
+        GlobalLock::Unlock();
+    }
+}
+
+void GlobalLockGuard::Release() {
+    held = false;
+    GlobalLock::Unlock();
+}
+
+void GlobalLockGuard::Retake() {
+    GlobalLock::Lock();
+    held = true;
+}
+
+}  // namespace vantor

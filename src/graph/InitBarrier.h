@@ -1,0 +1,38 @@
+#ifndef VANTOR_GRAPH_INITBARRIER_H
+#define VANTOR_GRAPH_INITBARRIER_H
+
+#include <list>
+#include <string>
+
+#include "graph/Node.h"
+
+namespace vantor {
+
+// A named initialisation barrier: the point in a boot at which every plugin that provides the name
+// has finished. Plugins know barriers, never each other. Barriers are created on first mention,
+// owned by nobody and live until the process ends.
+class InitBarrier : public Node {
+public:
+    // The barrier of that name, created if this is its first mention; the same object every time.
+    // Names are compared byte by byte. Takes GlobalLock.
+    static InitBarrier* Get(const std::string& barrierName);
+
+    // All barriers, ascending by name. Takes GlobalLock.
+    static std::list<InitBarrier*> All();
+
+    // Raises a system alert that names the plugins that wait for the barrier when no plugin
+    // provides it; in invoke mode, where most plugins are not loaded, it stays silent. The waiting
+    // plugins run either way.
+    void Run() override;
+
+    std::string DotAttributes() const override;
+
+private:
+    explicit InitBarrier(const std::string& barrierName);
+
+    std::string MissingProviderText() const;
+};
+
+}  // namespace vantor
+
+#endif

@@ -1,0 +1,99 @@
+#ifndef VANTOR_GRAPH_NODE_H
+#define VANTOR_GRAPH_NODE_H
+
+#include <pthread.h>
+
+#include <cstdint>
+#include <list>
+#include <string>
+
+namespace vantor {
+
+class Executor;
+
+// How far a node has come. It only ever moves downwards in this list.
+enum class NodeState : std::int32_t {
+    Idle = 0,     // constructed, not yet requested
+    Waiting = 1,  // requested; at least one dependency is not done
+    Queued = 2,   // in the executor's ready queue, or running
+    Done = 3,     // finished, or declared finished without running
+};
+
+// A node of the process-wide dependency graph: a plugin, or a barrier between plugins. An edge
+// stands in the lists of both its ends; the lists do not own the nodes.
+//
+//   Idle --Schedule--> Waiting --Schedule, all dependencies done--> Queued --Execute--> Done
+//   Idle --Schedule, all dependencies done--> Queued
+//   Idle --MarkDone--> Done
+//
+// There is no way back and no state for failure: what became of a plugin's method is the plugin's
+// own record. All state and both lists are guarded by GlobalLock, which every operation takes
+// itself unless it says otherwise; calling them with the lock held is allowed. Edges are added only
+// before any worker exists. Nothing looks for cycles: a node on one is never run.
+class Node {
+public:
+    // Throws Exception when the condition variable cannot be initialised.
+    explicit Node(std::string nodeName);
+
+    Node(const Node&) = delete;
+    Node& operator=(const Node&) = delete;
+
+    // Does the node's work. Called by a worker thread, without the lock. Must not throw.
+    virtual void Run() = 0;
+
+    // What the drawn graph says about the node after its label; empty, or starting with a blank.
+    virtual std::string DotAttributes() const = 0;
+
+    // Takes the node out of the lists of its neighbours, so that a plugin whose construction fails
+    // half-way leaves no pointer to itself behind.
+    virtual ~Node();
+
+    const std::string& Name() const { return name; }
+
+    // These take no lock: who walks a list holds it.
+    const std::list<Node*>& Dependencies() const { return dependencies; }
+    const std::list<Node*>& Dependents() const { return dependents; }
+
+    NodeState State() const;
+
+    // This node waits for `other`. The same edge may be added more than once and is then kept more
+    // than once. Neither pointer is owned.
+    void AddDependency(Node& other);
+
+    // `other` waits for this node.
+    void AddDependent(Node& other);
+
+    // Requests that the node run: it is queued at once when all its dependencies are done;
+    // otherwise they are requested too and the last of them to finish queues it. Does nothing for a
+    // node that is queued or done.
+    void Schedule(Executor& executor);
+
+    // Runs the node, marks it done and queues the requested dependents that were waiting for it
+    // alone. Called by a worker that took the node from the queue and does not hold the lock.
+    void Execute(Executor& executor);
+
+    // Blocks until the node is done.
+    void WaitDone();
+
+    // Declares the node finished without running it. Wakes nobody and looks at no dependent: for
+    // use before execution starts.
+    void MarkDone();
+
+    // Number of nodes on the longest chain that starts here and follows dependents: 1 for a node
+    // that none waits for. Computed once and kept, so no edge may be added below this node after
+    // the first call.
+    std::int32_t Height();
+
+private:
+    bool heightKnown = false;
+    std::int32_t height = -1;
+    NodeState state = NodeState::Idle;
+    std::string name;
+    std::list<Node*> dependencies;
+    std::list<Node*> dependents;
+    pthread_cond_t doneCondition;  // broadcast when the node becomes done through Execute()
+};
+
+}  // namespace vantor
+
+#endif

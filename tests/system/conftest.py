@@ -1,0 +1,114 @@
+"""Fixtures: the session's base root and way of isolation, and one private root for each test."""
+
+import os
+import signal
+import sys
+import tempfile
+
+import pytest
+
+sys.dont_write_bytecode = True
+
+# pylint: disable=wrong-import-position
+from harness.base_root import BaseRoot, BuildError, compile_program  # noqa: E402
+from harness.isolation import Isolation, IsolationError  # noqa: E402
+from harness.native_plugin import PluginFactory  # noqa: E402
+from harness.private_root import PrivateRoot  # noqa: E402
+from harness.runner import Run  # noqa: E402
+from harness.sanitizers import Sanitizers  # noqa: E402
+
+_HERE = os.path.dirname(os.path.abspath(__file__))
+_PROGRAMS = os.path.join(_HERE, "harness", "programs")
+_notices = []
+
+
+class Session:
+    """What all tests share: made once, removed at the end, whatever happens in between."""
+
+    def __init__(self, folder):
+        build = os.environ.get("VANTOR_BUILD_DIR", os.path.join(_HERE, "..", "..", "build/default"))
+        self._folder, self._count = folder, 0
+        self.base = BaseRoot(os.path.join(folder, "base"), os.path.realpath(build))
+        self.base.add_program(os.path.join(_PROGRAMS, "witness.c"), "usr/bin/witness")
+        self.enter = os.path.join(folder, "enter")
+        compile_program(os.path.join(_PROGRAMS, "enter.c"), self.enter)
+        PluginFactory.open(os.path.join(folder, "plugins"))
+        # From here on this process sees mounts of its own.
+        self.isolation = Isolation(os.environ.get("VANTOR_TEST_ISOLATION", ""))
+        self.sanitizers = Sanitizers(self.base.sanitizers, self.isolation, folder)
+
+    def new_root(self):
+        self._count += 1
+        root = PrivateRoot(self.base, self.isolation, os.path.join(self._folder, str(self._count)))
+        self.sanitizers.prepare(root)
+        return root
+
+
+def pytest_configure(config):
+    """A terminated session cleans up as an interrupted one does."""
+    del config
+    signal.signal(signal.SIGTERM, signal.default_int_handler)
+
+
+@pytest.fixture(scope="session")
+def session():
+    """The base root, the plugins' factory and the way into a root."""
+    folder = tempfile.mkdtemp(prefix="vantor-")
+    try:
+        made = Session(folder)
+        _notices.append(f"isolation: {made.isolation.way}")
+        if made.sanitizers.notice:
+            _notices.append(f"leaks are NOT looked for: {made.sanitizers.notice}")
+        yield made
+    except (BuildError, IsolationError) as error:
+        pytest.exit(f"no system test can run: {error}", returncode=3)
+    finally:
+        Isolation.remove_tree(folder)
+
+
+@pytest.fixture
+def root(session, request):
+    """A host of its own for one test."""
+    made = session.new_root()
+    request.node.private_root = made
+    yield made
+    made.remove_all()
+
+
+@pytest.fixture
+def start(session, root):
+    """start(argument..., **how) begins a run of the program; see Run."""
+    runs = []
+
+    def begin(*arguments, **how):
+        runs.append(Run(root, session, arguments, **how))
+        return runs[-1]
+
+    yield begin
+    for run in runs:
+        run.kill()
+
+
+@pytest.fixture
+def vantor(start):
+    """vantor(argument..., **how) runs the program to its end and returns the Result."""
+    return lambda *arguments, **how: start(*arguments, **how).wait()
+
+
+@pytest.hookimpl(hookwrapper=True)
+def pytest_runtest_makereport(item):
+    """Adds to the report of a failed test what its runs wrote and left."""
+    outcome = yield
+    report = outcome.get_result()
+    made = getattr(item, "private_root", None)
+    if report.failed and report.when == "call" and made:
+        for number, run in enumerate(made.runs, 1):
+            report.sections.append((f"run {number}", str(run)))
+        report.sections.append(("system alerts", "\n".join(made.alerts())))
+        report.sections.append(("/tmp/ran", "\n".join(made.ran())))
+
+
+def pytest_terminal_summary(terminalreporter):
+    """Says how the roots were isolated, and what could not be looked for."""
+    for notice in _notices:
+        terminalreporter.write_line(f"system tests: {notice}")

@@ -1,0 +1,104 @@
+/* Runs a program with a folder as its "/": enter [options] ROOT PROGRAM ARGUMENT...
+ *
+ *   -c FOLDER   working directory inside the root (default "/")
+ *   -f BYTES    files may grow to so many bytes: writing past them fails, without a signal
+ *   -n COUNT    open-file limit, as near to COUNT as this process may raise it
+ *   -l NUMBER   a descriptor of that number is left open for the program (repeatable)
+ *   -g          lead a process group of its own, so that no new session can be made
+ *   -a          without address space randomisation
+ *
+ * 125 is the status of every failure before the program runs.
+ */
+#define _GNU_SOURCE
+
+#include <errno.h>
+#include <fcntl.h>
+#include <signal.h>
+#include <stdio.h>
+#include <stdlib.h>
+#include <string.h>
+#include <sys/personality.h>
+#include <sys/resource.h>
+#include <unistd.h>
+
+static void Fail(const char* what) {
+    fprintf(stderr, "enter: %s: %s\n", what, strerror(errno));
+    exit(125);
+}
+
+static void LimitFileSize(const char* bytes) {
+    const rlim_t size = strtoul(bytes, NULL, 10);
+    const struct rlimit limit = {size, size};
+    signal(SIGXFSZ, SIG_IGN);
+    if (setrlimit(RLIMIT_FSIZE, &limit) != 0) {
+        Fail("file size");
+    }
+}
+
+/* Halves the wish until the kernel grants it; the hard limit is granted to everyone. */
+static void LimitOpenFiles(const char* count) {
+    struct rlimit now;
+    if (getrlimit(RLIMIT_NOFILE, &now) != 0) {
+        Fail("open files");
+    }
+    for (rlim_t wish = strtoul(count, NULL, 10); wish > now.rlim_max; wish /= 2) {
+        const struct rlimit limit = {wish, wish};
+        if (setrlimit(RLIMIT_NOFILE, &limit) == 0) {
+            return;
+        }
+    }
+    const rlim_t wish = strtoul(count, NULL, 10);
+    now.rlim_cur = wish < now.rlim_max ? wish : now.rlim_max;
+    if (setrlimit(RLIMIT_NOFILE, &now) != 0) {
+        Fail("open files");
+    }
+}
+
+static void LeakDescriptor(const char* number) {
+    const int pipeEnd = open("/", O_RDONLY);
+    if (pipeEnd < 0 || dup2(pipeEnd, atoi(number)) < 0) {
+        Fail("descriptor");
+    }
+    if (pipeEnd != atoi(number)) {
+        close(pipeEnd);
+    }
+}
+
+int main(int argc, char** argv) {
+    const char* folder = "/";
+    int option;
+    while ((option = getopt(argc, argv, "+c:f:n:l:ga")) != -1) {
+        switch (option) {
+        case 'c':
+            folder = optarg;
+            break;
+        case 'f':
+            LimitFileSize(optarg);
+            break;
+        case 'n':
+            LimitOpenFiles(optarg);
+            break;
+        case 'l':
+            LeakDescriptor(optarg);
+            break;
+        case 'g':
+            setpgid(0, 0);
+            break;
+        case 'a':
+            /* Where a container forbids it the program runs as it is. */
+            (void)personality(ADDR_NO_RANDOMIZE);
+            break;
+        default:
+            return 125;
+        }
+    }
+    if (argc - optind < 2) {
+        errno = EINVAL;
+        Fail("arguments");
+    }
+    if (chroot(argv[optind]) != 0 || chdir(folder) != 0) {
+        Fail(argv[optind]);
+    }
+    execv(argv[optind + 1], argv + optind + 1);
+    Fail(argv[optind + 1]);
+}

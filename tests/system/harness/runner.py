@@ -1,0 +1,107 @@
+"""Runs of the program inside a private root."""
+
+import os
+import signal
+import subprocess
+from dataclasses import dataclass, field
+
+from harness import sanitizers
+from harness.streams import PipeRecorder
+from harness.waiting import LIMIT_SECONDS, is_asleep, wait_until
+
+PROGRAM = "/usr/sbin/vantor"
+ENVIRONMENT = {"PATH": "/usr/sbin:/usr/bin:/sbin:/bin"}
+
+
+@dataclass
+class Result:
+    """What one finished run left: its exit status, its two outputs, its syslog messages."""
+
+    command: list
+    status: int
+    stdout: str
+    stderr: str
+    syslog: list = field(default_factory=list)
+
+    @property
+    def messages(self):
+        """The syslog messages as pairs of priority and text."""
+        return [(message.priority, message.text) for message in self.syslog]
+
+    def texts(self, priority):
+        """The texts of the messages of one priority."""
+        return [message.text for message in self.syslog if message.priority == priority]
+
+    def __str__(self):
+        lines = [f"<{message.priority}> {message.text}" for message in self.syslog]
+        return "\n".join([
+            f"command: {' '.join(self.command)}", f"status:  {self.status}",
+            f"stdout:\n{self.stdout}", f"stderr:\n{self.stderr}", "syslog:", *lines])
+
+
+class Run:
+    """A run under way; wait() ends it. Standard input is empty unless a descriptor is given."""
+
+    def __init__(self, root, session, arguments, stdin=None, stdout=None, program=PROGRAM,
+                 environment=None, cwd="/", file_size=None, open_files=None, leaked=(),
+                 group_leader=False):
+        self._root, self._command = root, [program, *arguments]
+        self._pipes = [PipeRecorder(), PipeRecorder()]
+        options = session.sanitizers.enter_options() + ["-c", cwd]
+        options += ["-g"] if group_leader else []
+        options += ["-f", str(file_size)] if file_size is not None else []
+        options += ["-n", str(open_files)] if open_files is not None else []
+        for number in leaked:
+            options += ["-l", str(number)]
+        variables = {**ENVIRONMENT, **session.sanitizers.environment(), **(environment or {})}
+        self._process = subprocess.Popen(
+            [session.enter, *options, root.folder, *self._command],
+            stdin=subprocess.DEVNULL if stdin is None else stdin,
+            stdout=self._pipes[0].write_end if stdout is None else stdout,
+            stderr=self._pipes[1].write_end, env=variables)
+        self.pid = self._process.pid
+
+    def stdout_so_far(self):
+        return self._pipes[0].so_far()
+
+    def has_ended(self):
+        return self._process.poll() is not None
+
+    def wait_until(self, condition, what):
+        """Waits for a condition that the run brings about, but no longer than the run lasts."""
+
+        def met():
+            ended = self.has_ended()
+            value = condition()
+            if ended and not value:
+                raise AssertionError(f"the run ended before {what}\n{self.wait()}")
+            return value
+
+        return wait_until(met, what)
+
+    def wait_until_asleep(self):
+        """Waits until the main thread does nothing but wait: for nodes, or for a child."""
+        self.wait_until(lambda: is_asleep(self.pid), "the main thread waits")
+
+    def wait(self):
+        """The result; fails when the program hangs or its sanitizer reports anything."""
+        try:
+            status = self._process.wait(LIMIT_SECONDS)
+        except subprocess.TimeoutExpired:
+            status = None
+            self.kill()
+        result = Result(self._command, status, self._pipes[0].take(), self._pipes[1].take(),
+                        self._root.syslog.take())
+        for pipe in self._pipes:
+            pipe.close()
+        self._root.runs.append(result)
+        if status is None:
+            raise AssertionError(f"the program hangs\n{result}")
+        sanitizers.check(status, result.stderr)
+        return result
+
+    def kill(self):
+        """Ends the program at once; its children are the root's to end."""
+        if not self.has_ended():
+            os.kill(self.pid, signal.SIGKILL)
+            self._process.wait()
