@@ -43,7 +43,7 @@ extern "C" {
  * A list of names: pointers to NUL-terminated byte strings, ended by a null pointer. A null list is
  * an empty one. Lists and strings must stay valid until the process ends.
  */
-typedef const char *const *vantor_names;
+typedef const char* const* vantor_names;
 
 /* "requires" is a keyword from C++20 on; there the field goes by another name. */
 #if defined(__cplusplus) && __cplusplus > 201703L
@@ -98,7 +98,7 @@ struct vantor_metadata_3 {
      * key under which a run-once plugin is recorded, so keep to ASCII letters, digits and "-._+":
      * other characters are dropped from the record, and the plugin is then never recognised.
      */
-    const char *plugin_version;
+    const char* plugin_version;
     /* Not 0: to be run only once for each plugin version. */
     uint8_t run_once;
     /* Boot flags that must all be set for the plugin to be run. */
@@ -117,9 +117,9 @@ struct vantor_metadata_3 {
 #endif
 
 /* vantor and its plugins are built apart: the layout is the agreement, at both word sizes. */
-#define VANTOR_ASSERT_OFFSET_(type, field, offset32, offset64)                                  \
-    VANTOR_STATIC_ASSERT_(offsetof(struct type, field) ==                                       \
-                              (sizeof(void *) == 4 ? offset32##U : offset64##U),               \
+#define VANTOR_ASSERT_OFFSET_(type, field, offset32, offset64)                                     \
+    VANTOR_STATIC_ASSERT_(offsetof(struct type, field) ==                                          \
+                              (sizeof(void*) == 4 ? offset32##U : offset64##U),                    \
                           "unexpected offset of " #field)
 
 VANTOR_ASSERT_OFFSET_(vantor_operations, start, 0, 0);
@@ -146,26 +146,26 @@ VANTOR_ASSERT_OFFSET_(vantor_metadata_3, disabling_flags, 24, 48);
  */
 
 /* Exports a table with a start method alone. */
-#define VANTOR_OPERATIONS(start)                                  \
-    VANTOR_METHOD(start);                                         \
-    VANTOR_EXPORTED_ const struct vantor_operations operations;   \
+#define VANTOR_OPERATIONS(start)                                                                   \
+    VANTOR_METHOD(start);                                                                          \
+    VANTOR_EXPORTED_ const struct vantor_operations operations;                                    \
     const struct vantor_operations operations = {start, NULL}
 
 /* Exports a table with both methods; for version 2 and above. */
-#define VANTOR_OPERATIONS_WITH_HOST_PROFILE(start, apply_host_profile) \
-    VANTOR_METHOD(start);                                              \
-    VANTOR_METHOD(apply_host_profile);                                 \
-    VANTOR_EXPORTED_ const struct vantor_operations operations;        \
+#define VANTOR_OPERATIONS_WITH_HOST_PROFILE(start, apply_host_profile)                             \
+    VANTOR_METHOD(start);                                                                          \
+    VANTOR_METHOD(apply_host_profile);                                                             \
+    VANTOR_EXPORTED_ const struct vantor_operations operations;                                    \
     const struct vantor_operations operations = {start, apply_host_profile}
 
-#define VANTOR_METADATA_SHORT_(version, needs, gives)            \
-    VANTOR_EXPORTED_ const struct vantor_metadata_1 metadata;    \
+#define VANTOR_METADATA_SHORT_(version, needs, gives)                                              \
+    VANTOR_EXPORTED_ const struct vantor_metadata_1 metadata;                                      \
     const struct vantor_metadata_1 metadata = {version, needs, gives}
 
-#define VANTOR_METADATA_LONG_(version, needs, gives, plugin_version, run_once, required_flags, \
-                              disabling_flags)                                                 \
-    VANTOR_EXPORTED_ const struct vantor_metadata_3 metadata;                                  \
-    const struct vantor_metadata_3 metadata = {                                                \
+#define VANTOR_METADATA_LONG_(version, needs, gives, plugin_version, run_once, required_flags,     \
+                              disabling_flags)                                                     \
+    VANTOR_EXPORTED_ const struct vantor_metadata_3 metadata;                                      \
+    const struct vantor_metadata_3 metadata = {                                                    \
         version, needs, gives, plugin_version, run_once, required_flags, disabling_flags}
 
 /*
@@ -175,8 +175,10 @@ VANTOR_ASSERT_OFFSET_(vantor_metadata_3, disabling_flags, 24, 48);
 #define VANTOR_METADATA_1(needs, gives) VANTOR_METADATA_SHORT_(1, needs, gives)
 #define VANTOR_METADATA_2(needs, gives) VANTOR_METADATA_SHORT_(2, needs, gives)
 #define VANTOR_METADATA_3(needs, gives, plugin_version, run_once, required_flags, disabling_flags) \
-    VANTOR_METADATA_LONG_(3, needs, gives, plugin_version, run_once, required_flags, disabling_flags)
+    VANTOR_METADATA_LONG_(3, needs, gives, plugin_version, run_once, required_flags,               \
+                          disabling_flags)
 #define VANTOR_METADATA_4(needs, gives, plugin_version, run_once, required_flags, disabling_flags) \
-    VANTOR_METADATA_LONG_(4, needs, gives, plugin_version, run_once, required_flags, disabling_flags)
+    VANTOR_METADATA_LONG_(4, needs, gives, plugin_version, run_once, required_flags,               \
+                          disabling_flags)
 
 #endif

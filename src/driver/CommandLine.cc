@@ -15,46 +15,6 @@ namespace vantor {
 
 namespace {
 
-// Codes above any character, so that no short option can be taken for a long one.
-enum OptionCode : int {
-    Help = 'h',
-    Init = 256,
-    PluginFlags,
-    TraceRun,
-    Invoke,
-    Method,
-    SelectPlugin,
-    Verbose,
-    Parallel,
-    Randomize,
-    RunOnce,
-    Interactive,
-    DisablePlugins,
-    PluginDirectory,
-    DumpDependencyTree,
-    InteractiveModeRequires,
-};
-
-const option longOptions[] = {
-    {"help", no_argument, nullptr, Help},
-    {"init", no_argument, nullptr, Init},
-    {"plugin-flags", required_argument, nullptr, PluginFlags},
-    {"trace", no_argument, nullptr, TraceRun},
-    {"invoke", no_argument, nullptr, Invoke},
-    {"method", required_argument, nullptr, Method},
-    {"plugin", required_argument, nullptr, SelectPlugin},
-    {"verbose", no_argument, nullptr, Verbose},
-    {"parallel", no_argument, nullptr, Parallel},
-    {"randomize", optional_argument, nullptr, Randomize},
-    {"run-once", required_argument, nullptr, RunOnce},
-    {"interactive", no_argument, nullptr, Interactive},
-    {"disable-plugins", required_argument, nullptr, DisablePlugins},
-    {"plugin-directory", required_argument, nullptr, PluginDirectory},
-    {"dump-dependency-tree", optional_argument, nullptr, DumpDependencyTree},
-    {"interactive-mode-requires", required_argument, nullptr, InteractiveModeRequires},
-    {nullptr, 0, nullptr, 0},
-};
-
 // Items between commas. Empty ones are dropped; blanks belong to their item.
 std::vector<std::string> SplitList(const std::string& text) {
     using Separator = boost::char_separator<char>;
@@ -81,81 +41,108 @@ void ReadSeed(const char* argument, std::int32_t& seed) {
     }
 }
 
-void ApplyOption(int code, RunConfig& config, DriverOptions& options) {
-    switch (code) {
-        case Init:
-            options.init = true;
-            break;
-        case PluginFlags:
-            options.pluginFlags.clear();
-            Insert(options.pluginFlags, optarg);
-            break;
-        case TraceRun:
-            config.trace = true;
-            break;
-        case Invoke:
-            config.invoke = true;
-            break;
-        case Method:
-            config.method = optarg;
-            break;
-        case SelectPlugin:
-            Append(options.selectedPlugins, optarg);
-            break;
-        case Verbose:
-            config.verbose = true;
-            break;
-        case Parallel:
-            config.parallel = true;
-            config.interactive = false;
-            break;
-        case Randomize:
-            config.randomize = true;
-            if (optarg != nullptr) {
-                ReadSeed(optarg, config.seed);
-            }
-            break;
-        case RunOnce:
-            Insert(options.runOncePlugins, optarg);
-            break;
-        case Interactive:
-            config.interactive = true;
-            config.parallel = false;
-            break;
-        case DisablePlugins:
-            Append(config.disabledPlugins, optarg);
-            break;
-        case PluginDirectory:
-            options.pluginDirectory = optarg;
-            break;
-        case DumpDependencyTree:
-            options.dump = true;
-            options.dumpPath =
-                optarg != nullptr ? std::optional<std::string>(optarg) : std::nullopt;
-            break;
-        case InteractiveModeRequires:
-            Append(config.interactiveModeRequires, optarg);
-            break;
-        default:
-            break;
+// One long option: its argument as getopt_long(3) counts it, and what it does. `argument` is null
+// where none was given. Without an action: the help, which ends the parsing.
+struct OptionRule {
+    const char* name;
+    int argumentKind;
+    void (*apply)(RunConfig& config, DriverOptions& options, const char* argument);
+};
+
+const OptionRule rules[] = {
+    {"help", no_argument, nullptr},
+    {"init", no_argument,
+     [](RunConfig&, DriverOptions& options, const char*) { options.init = true; }},
+    {"plugin-flags", required_argument,
+     [](RunConfig&, DriverOptions& options, const char* argument) {
+         options.pluginFlags.clear();
+         Insert(options.pluginFlags, argument);
+     }},
+    {"trace", no_argument,
+     [](RunConfig& config, DriverOptions&, const char*) { config.trace = true; }},
+    {"invoke", no_argument,
+     [](RunConfig& config, DriverOptions&, const char*) { config.invoke = true; }},
+    {"method", required_argument,
+     [](RunConfig& config, DriverOptions&, const char* argument) { config.method = argument; }},
+    {"plugin", required_argument,
+     [](RunConfig&, DriverOptions& options, const char* argument) {
+         Append(options.selectedPlugins, argument);
+     }},
+    {"verbose", no_argument,
+     [](RunConfig& config, DriverOptions&, const char*) { config.verbose = true; }},
+    {"parallel", no_argument,
+     [](RunConfig& config, DriverOptions&, const char*) {
+         config.parallel = true;
+         config.interactive = false;
+     }},
+    {"randomize", optional_argument,
+     [](RunConfig& config, DriverOptions&, const char* argument) {
+         config.randomize = true;
+         if (argument != nullptr) {
+             ReadSeed(argument, config.seed);
+         }
+     }},
+    {"run-once", required_argument,
+     [](RunConfig&, DriverOptions& options, const char* argument) {
+         Insert(options.runOncePlugins, argument);
+     }},
+    {"interactive", no_argument,
+     [](RunConfig& config, DriverOptions&, const char*) {
+         config.interactive = true;
+         config.parallel = false;
+     }},
+    {"disable-plugins", required_argument,
+     [](RunConfig& config, DriverOptions&, const char* argument) {
+         Append(config.disabledPlugins, argument);
+     }},
+    {"plugin-directory", required_argument,
+     [](RunConfig&, DriverOptions& options, const char* argument) {
+         options.pluginDirectory = argument;
+     }},
+    {"dump-dependency-tree", optional_argument,
+     [](RunConfig&, DriverOptions& options, const char* argument) {
+         options.dump = true;
+         options.dumpPath =
+             argument != nullptr ? std::optional<std::string>(argument) : std::nullopt;
+     }},
+    {"interactive-mode-requires", required_argument,
+     [](RunConfig& config, DriverOptions&, const char* argument) {
+         Append(config.interactiveModeRequires, argument);
+     }},
+};
+
+// The code that getopt_long(3) returns for the first rule; above any character, so that no short
+// option can be taken for a long one.
+constexpr int firstCode = 256;
+
+std::vector<option> LongOptions() {
+    std::vector<option> result;
+    int code = firstCode;
+    for (const OptionRule& rule : rules) {
+        result.push_back({rule.name, rule.argumentKind, nullptr, code});
+        ++code;
     }
+    result.push_back({nullptr, 0, nullptr, 0});
+    return result;
 }
 
 }  // namespace
 
 std::optional<int> ParseCommandLine(int argc, char** argv, RunConfig& config,
                                     DriverOptions& options) {
+    const std::vector<option> longOptions = LongOptions();
     int code = 0;
-    while ((code = getopt_long(argc, argv, "h", longOptions, nullptr)) != -1) {
-        if (code == Help) {
-            PrintUsage();
-            return EXIT_SUCCESS;
-        }
+    while ((code = getopt_long(argc, argv, "h", longOptions.data(), nullptr)) != -1) {
         if (code == '?') {
             std::cerr << "usage: " << argv[0] << " --help for usage information" << std::endl;
             return EXIT_FAILURE;
         }
-        ApplyOption(code, config, options);
+        const OptionRule& rule = code == 'h' ? rules[0] : rules[code - firstCode];
+        if (rule.apply == nullptr) {
+            PrintUsage();
+            return EXIT_SUCCESS;
+        }
+        rule.apply(config, options, optarg);
     }
     if (config.invoke && (config.method.empty() || options.selectedPlugins.empty())) {
         std::cerr << "invoke requires a method and plugin specified.";

@@ -36,12 +36,12 @@ private:
 
     RunConfig& config;
     DriverOptions options;
-    std::optional<int> earlyExit;      // set when the command line ends the program
-    timeval startTime{};               // wall clock, before the command line is parsed
-    std::uint64_t uptimeSeconds = 0;   // of the kernel, at the same moment
-    std::set<std::string> bootFlags;   // the loader's copy of the plugin flags
-    PluginQueue plugins;               // in load order, filled by the loader
-    PluginQueue nodes;                 // what is run, drawn and reported, once loading is complete
+    std::optional<int> earlyExit;     // set when the command line ends the program
+    timeval startTime{};              // wall clock, before the command line is parsed
+    std::uint64_t uptimeSeconds = 0;  // of the kernel, at the same moment
+    std::set<std::string> bootFlags;  // the loader's copy of the plugin flags
+    PluginQueue plugins;              // in load order, filled by the loader
+    PluginQueue nodes;                // what is run, drawn and reported, once loading is complete
     bool succeeded = false;
 };
 

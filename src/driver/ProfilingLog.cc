@@ -23,11 +23,11 @@ std::ostream& FormatTime(std::ostream& stream, const timeval& time) {
     const std::time_t seconds = time.tv_sec;
     gmtime_r(&seconds, &utc);
     return stream << std::setfill('0') << std::setw(4) << utc.tm_year + 1900 << '-'  //
-                  << std::setw(2) << utc.tm_mon + 1 << '-'                            //
-                  << std::setw(2) << utc.tm_mday << ' '                               //
-                  << std::setw(2) << utc.tm_hour << ':'                               //
-                  << std::setw(2) << utc.tm_min << ':'                                //
-                  << std::setw(2) << utc.tm_sec << '.'                                //
+                  << std::setw(2) << utc.tm_mon + 1 << '-'                           //
+                  << std::setw(2) << utc.tm_mday << ' '                              //
+                  << std::setw(2) << utc.tm_hour << ':'                              //
+                  << std::setw(2) << utc.tm_min << ':'                               //
+                  << std::setw(2) << utc.tm_sec << '.'                               //
                   << std::setw(6) << time.tv_usec;
 }
 

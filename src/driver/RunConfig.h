@@ -27,8 +27,8 @@ public:
     bool trace = false;        // report each plugin on standard output
     std::int32_t threads = 8;  // workers; 1 once a command line without --parallel is parsed
     std::int32_t seed;         // reported, not used; seconds since the epoch unless given
-    boost::filesystem::path pluginDirectory;        // absolute once the driver has started
-    std::list<std::string> disabledPlugins;         // plugin names
+    boost::filesystem::path pluginDirectory;         // absolute once the driver has started
+    std::list<std::string> disabledPlugins;          // plugin names
     std::list<std::string> interactiveModeRequires;  // plugins to run before the first prompt
     std::string method;   // method to run in place of the usual one; empty: the usual one
     bool invoke = false;  // run `method` of the selected plugins and nothing else

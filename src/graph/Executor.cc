@@ -21,8 +21,7 @@ struct WorkerStart {
 
 }  // namespace
 
-Executor::Executor(std::int32_t threadCount, bool randomizeEquals)
-    : randomize(randomizeEquals) {
+Executor::Executor(std::int32_t threadCount, bool randomizeEquals) : randomize(randomizeEquals) {
     if (pthread_cond_init(&workAvailable, nullptr) != 0) {
         throw Exception("Condition variable for Executor could not be initialized");
     }

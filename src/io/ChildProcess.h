@@ -9,14 +9,14 @@ namespace vantor {
 // the caller and outlives the call: the child itself only makes async-signal-safe calls, because
 // other threads may hold any lock at the moment of the fork.
 struct ChildSetup {
-    const char* path = nullptr;           // program to execute
-    char* const* arguments = nullptr;     // argument vector, ended by a null pointer
-    char* const* environment = nullptr;   // environment, ended by a null pointer
-    bool newSession = false;              // become the leader of a session of its own
-    int closeFrom = 0;                    // close every descriptor from here on but the kept ones
+    const char* path = nullptr;          // program to execute
+    char* const* arguments = nullptr;    // argument vector, ended by a null pointer
+    char* const* environment = nullptr;  // environment, ended by a null pointer
+    bool newSession = false;             // become the leader of a session of its own
+    int closeFrom = 0;                   // close every descriptor from here on but the kept ones
     KeptDescriptors kept;
-    bool takeTerminal = false;            // make standard input the controlling terminal, taking
-                                          // it from any other session; a refusal is ignored
+    bool takeTerminal = false;  // make standard input the controlling terminal, taking
+                                // it from any other session; a refusal is ignored
 };
 
 // How far a child came.

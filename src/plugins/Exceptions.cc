@@ -13,8 +13,7 @@ const char* Exception::what() const noexcept { return message.c_str(); }
 NotImplementedException::NotImplementedException(const std::string& method)
     : Exception("method `" + method + "' is not implemented") {}
 
-InvalidPluginException::InvalidPluginException(const std::string& plugin,
-                                               const std::string& reason)
+InvalidPluginException::InvalidPluginException(const std::string& plugin, const std::string& reason)
     : Exception("plugin `" + plugin + "' is invalid: " + reason) {}
 
 }  // namespace vantor

@@ -126,18 +126,18 @@ char Prompt(const std::string& pluginName) {
 // Returns false to skip the plugin.
 bool Obey(char choice, const std::string& pluginName) {
     switch (choice) {
-        case 'c':
-            RunConfig::Instance().interactive = false;
-            SwitchToVirtualTerminal(bootTerminal);
-            return true;
-        case 's':
-            syslog(LOG_INFO, "skipping plugin %s (interactive mode request)", pluginName.c_str());
-            return false;
-        case 't':
-            RunTroubleshootingShell();
-            return true;
-        default:
-            return true;
+    case 'c':
+        RunConfig::Instance().interactive = false;
+        SwitchToVirtualTerminal(bootTerminal);
+        return true;
+    case 's':
+        syslog(LOG_INFO, "skipping plugin %s (interactive mode request)", pluginName.c_str());
+        return false;
+    case 't':
+        RunTroubleshootingShell();
+        return true;
+    default:
+        return true;
     }
 }
 

@@ -18,8 +18,8 @@ std::int64_t Plugin::ElapsedMicroseconds() const {
     // Unsigned arithmetic wraps where signed arithmetic would overflow.
     const auto seconds =
         static_cast<std::uint32_t>(endTime.tv_sec) - static_cast<std::uint32_t>(startTime.tv_sec);
-    const auto microseconds = static_cast<std::uint32_t>(endTime.tv_usec) -
-                              static_cast<std::uint32_t>(startTime.tv_usec);
+    const auto microseconds =
+        static_cast<std::uint32_t>(endTime.tv_usec) - static_cast<std::uint32_t>(startTime.tv_usec);
     return static_cast<std::int32_t>(seconds * 1000000U + microseconds);
 }
 

@@ -64,8 +64,8 @@ protected:
     void Require(const std::list<std::string>& barriers);
 
     std::int32_t apiVersion = -1;
-    bool runOnce = false;       // to run only once for each plugin version
-    std::string pluginVersion;  // the plugin's own version text
+    bool runOnce = false;                  // to run only once for each plugin version
+    std::string pluginVersion;             // the plugin's own version text
     std::set<std::string> requiredFlags;   // boot flags that must all be set
     std::set<std::string> disablingFlags;  // boot flags any of which keeps the plugin out
 

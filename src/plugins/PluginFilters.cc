@@ -56,9 +56,8 @@ bool IsFilteredOut(const Plugin& plugin, const std::set<std::string>& bootFlags,
         return true;
     }
     if (const FlagList missing = Missing(plugin.RequiredFlags(), bootFlags); !missing.empty()) {
-        syslog(LOG_WARNING,
-               "ignoring plugin '%s', disabled due to missing required boot flags: %s", name,
-               Enumerate(missing).c_str());
+        syslog(LOG_WARNING, "ignoring plugin '%s', disabled due to missing required boot flags: %s",
+               name, Enumerate(missing).c_str());
         return true;
     }
     return false;

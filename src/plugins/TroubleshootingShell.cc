@@ -26,18 +26,18 @@ void RunTroubleshootingShell() {
     const ChildOutcome outcome = RunChild(setup);
     const char* const errorText = std::strerror(outcome.error);
     switch (outcome.step) {
-        case ChildStep::Fork:
-            syslog(LOG_ERR, "failed to fork: %s", errorText);
-            std::cerr << std::string("unable to launch a troubleshooting shell:") + errorText + "\n";
-            return;
-        case ChildStep::Session:
-            syslog(LOG_ERR, "unable to create new session: %s", errorText);
-            break;
-        case ChildStep::Exec:
-            syslog(LOG_ERR, "unable to exec shell: %s", errorText);
-            break;
-        case ChildStep::Done:
-            break;
+    case ChildStep::Fork:
+        syslog(LOG_ERR, "failed to fork: %s", errorText);
+        std::cerr << std::string("unable to launch a troubleshooting shell:") + errorText + "\n";
+        return;
+    case ChildStep::Session:
+        syslog(LOG_ERR, "unable to create new session: %s", errorText);
+        break;
+    case ChildStep::Exec:
+        syslog(LOG_ERR, "unable to exec shell: %s", errorText);
+        break;
+    case ChildStep::Done:
+        break;
     }
     std::cout << "\033[2K" << std::flush;
 }

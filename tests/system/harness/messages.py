@@ -7,7 +7,9 @@ NO_PID_FILE = (WARNING, "unable to open nvksyslogd pid file")
 UNREADABLE_PID = (ERR, "unable to read nvsyslogd pid")
 BLAME = "This may be caused by a bad vantor plugin being installed on your system.\n"
 BOOT_FAILED = "Failed to boot the system.  An unhandled error has occurred.  " + BLAME
-INVOKE_FAILED = "Activating plugins has failed.  An unhandled error has occurred.  " + BLAME
+INVOKE_FAILED = "Activating plugins has failed. An unhandled error has occurred.  " + BLAME
+
+NOT_ELF = "This is no shared object, whatever its name may promise.\n" * 4
 
 
 def starting(*names):

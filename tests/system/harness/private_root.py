@@ -102,6 +102,16 @@ class PrivateRoot:
         with os.scandir(self.path(folder)) as entries:
             return [entry.name for entry in entries]
 
+    def all_files(self):
+        """The names of all files, but for those of the kernel."""
+        found = set()
+        for folder, folders, files in os.walk(self.folder):
+            if folder == self.folder:
+                folders.remove("proc")
+            place = "/" + os.path.relpath(folder, self.folder)
+            found |= {os.path.normpath(os.path.join(place, name)) for name in files}
+        return found
+
     def plugins_in_order(self):
         """The native plugins' names in load order."""
         return [name[3:-3] for name in self.listing() if name.endswith(".so")]

@@ -7,9 +7,10 @@ from dataclasses import dataclass, field
 
 from harness import sanitizers
 from harness.streams import PipeRecorder
-from harness.waiting import LIMIT_SECONDS, is_asleep, wait_until
+from harness.waiting import LIMIT_SECONDS, all_threads_asleep, is_asleep, wait_until
 
 PROGRAM = "/usr/sbin/vantor"
+LIMITS = {"file_size": "-f", "open_files": "-n", "stack_size": "-s"}
 ENVIRONMENT = {"PATH": "/usr/sbin:/usr/bin:/sbin:/bin"}
 
 
@@ -40,17 +41,25 @@ class Result:
 
 
 class Run:
-    """A run under way; wait() ends it. Standard input is empty unless a descriptor is given."""
+    """A run under way; wait() ends it.
+
+    stdin, stdout   descriptors in place of no input and of a recorded output
+    program         what is run, by its name inside the root
+    environment     further variables
+    cwd             the working directory, inside the root
+    group_leader    the program leads a process group, so that it cannot make a session
+    leaked          numbers of descriptors that are open for the program besides the standard ones
+    limits          file_size, open_files, stack_size: the resource limits of those names
+    """
 
     def __init__(self, root, session, arguments, stdin=None, stdout=None, program=PROGRAM,
-                 environment=None, cwd="/", file_size=None, open_files=None, leaked=(),
-                 group_leader=False):
+                 environment=None, cwd="/", group_leader=False, leaked=(), **limits):
         self._root, self._command = root, [program, *arguments]
         self._pipes = [PipeRecorder(), PipeRecorder()]
         options = session.sanitizers.enter_options() + ["-c", cwd]
         options += ["-g"] if group_leader else []
-        options += ["-f", str(file_size)] if file_size is not None else []
-        options += ["-n", str(open_files)] if open_files is not None else []
+        for limit, value in limits.items():
+            options += [LIMITS[limit], str(value)]
         for number in leaked:
             options += ["-l", str(number)]
         variables = {**ENVIRONMENT, **session.sanitizers.environment(), **(environment or {})}
@@ -82,6 +91,10 @@ class Run:
     def wait_until_asleep(self):
         """Waits until the main thread does nothing but wait: for nodes, or for a child."""
         self.wait_until(lambda: is_asleep(self.pid), "the main thread waits")
+
+    def wait_until_every_thread_sleeps(self):
+        """Waits until no thread has anything left to do by itself."""
+        self.wait_until(lambda: all_threads_asleep(self.pid), "every thread waits")
 
     def wait(self):
         """The result; fails when the program hangs or its sanitizer reports anything."""

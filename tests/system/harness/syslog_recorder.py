@@ -50,6 +50,11 @@ class SyslogRecorder:
             sender.connect(self._name)
             sender.send(datagram)
 
+    def hide(self):
+        """Takes the socket away from /dev/log; messages of other senders no longer arrive."""
+        os.rename(self._name, self._name + ".hidden")
+        self._name += ".hidden"
+
     def take(self):
         """All messages sent until now, each handed out once."""
         mark = uuid.uuid4().bytes

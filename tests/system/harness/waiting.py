@@ -1,5 +1,6 @@
 """Waiting for conditions. The limit is there for hung programs only, never to measure them."""
 
+import os
 import time
 
 LIMIT_SECONDS = 120
@@ -17,10 +18,23 @@ def wait_until(condition, what):
         time.sleep(0.002)
 
 
+def _sleeps(process, thread):
+    try:
+        with open(f"/proc/{process}/task/{thread}/stat", encoding="ascii") as file:
+            return file.read().rpartition(")")[2].split()[0] == "S"
+    except (FileNotFoundError, ProcessLookupError):
+        return False
+
+
 def is_asleep(process):
     """Whether the first thread of a process waits for something: another thread, a child, input."""
+    return _sleeps(process, process)
+
+
+def all_threads_asleep(process):
+    """Whether every thread of a process waits."""
     try:
-        with open(f"/proc/{process}/task/{process}/stat", encoding="ascii") as file:
-            return file.read().rpartition(")")[2].split()[0] == "S"
+        threads = os.listdir(f"/proc/{process}/task")
     except FileNotFoundError:
         return False
+    return all(_sleeps(process, thread) for thread in threads)

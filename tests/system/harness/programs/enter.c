@@ -3,6 +3,7 @@
  *   -c FOLDER   working directory inside the root (default "/")
  *   -f BYTES    files may grow to so many bytes: writing past them fails, without a signal
  *   -n COUNT    open-file limit, as near to COUNT as this process may raise it
+ *   -s BYTES    stack size limit, also that of every thread
  *   -l NUMBER   a descriptor of that number is left open for the program (repeatable)
  *   -g          lead a process group of its own, so that no new session can be made
  *   -a          without address space randomisation
@@ -54,20 +55,31 @@ static void LimitOpenFiles(const char* count) {
     }
 }
 
+static void LimitStackSize(const char* bytes) {
+    struct rlimit limit;
+    if (getrlimit(RLIMIT_STACK, &limit) != 0) {
+        Fail("stack size");
+    }
+    limit.rlim_cur = strtoul(bytes, NULL, 10);
+    if (setrlimit(RLIMIT_STACK, &limit) != 0) {
+        Fail("stack size");
+    }
+}
+
 static void LeakDescriptor(const char* number) {
-    const int pipeEnd = open("/", O_RDONLY);
-    if (pipeEnd < 0 || dup2(pipeEnd, atoi(number)) < 0) {
+    const int fd = open("/", O_RDONLY);
+    if (fd < 0 || dup2(fd, atoi(number)) < 0) {
         Fail("descriptor");
     }
-    if (pipeEnd != atoi(number)) {
-        close(pipeEnd);
+    if (fd != atoi(number)) {
+        close(fd);
     }
 }
 
 int main(int argc, char** argv) {
     const char* folder = "/";
     int option;
-    while ((option = getopt(argc, argv, "+c:f:n:l:ga")) != -1) {
+    while ((option = getopt(argc, argv, "+c:f:n:s:l:ga")) != -1) {
         switch (option) {
         case 'c':
             folder = optarg;
@@ -77,6 +89,9 @@ int main(int argc, char** argv) {
             break;
         case 'n':
             LimitOpenFiles(optarg);
+            break;
+        case 's':
+            LimitStackSize(optarg);
             break;
         case 'l':
             LeakDescriptor(optarg);

@@ -1,6 +1,6 @@
 /* Stands in for a daemon or a shell and notes how it was started, a line a fact, in
  * /tmp/seen.<name it was started by>: its arguments, its environment, its open descriptors,
- * whether it leads a session and whether standard input is the terminal of that session.
+ * its session, whether it leads it and whether standard input is the terminal of that session.
  * One more line, "ran <name>", goes to /tmp/ran.
  */
 #define _GNU_SOURCE
@@ -50,6 +50,7 @@ int main(int argc, char** argv) {
             fprintf(seen, "descriptor %d\n", fd);
         }
     }
+    fprintf(seen, "session %d\n", (int)getsid(0));
     fprintf(seen, "leads its session: %s\n", getsid(0) == getpid() ? "yes" : "no");
     fprintf(seen, "terminal of its session: %s\n", tcgetsid(0) == getsid(0) ? "yes" : "no");
     fclose(seen);
