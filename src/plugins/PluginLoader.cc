@@ -9,6 +9,7 @@
 #include "driver/DebugConfig.h"
 #include "graph/KeepUntilExit.h"
 #include "graph/SystemAlert.h"
+#include "json/JSONPlugin.h"
 #include "plugins/DebugPlugin.h"
 #include "plugins/NativePlugin.h"
 #include "plugins/PluginFilters.h"
@@ -53,9 +54,12 @@ void QueueDebugPlugins(const PluginFile& file, const std::list<DebugEntry>& entr
 
 // Null, and a word in syslog, for an extension that no kind of plugin has.
 std::unique_ptr<Plugin> Construct(const PluginFile& file, const RunConfig& config) {
+    const std::string path = (config.pluginDirectory / file.fileName).string();
     if (file.extension == "so") {
-        const std::string path = (config.pluginDirectory / file.fileName).string();
         return std::make_unique<NativePlugin>(file.name, path);
+    }
+    if (file.extension == "json") {
+        return std::make_unique<JSONPlugin>(file.name, path);
     }
     syslog(LOG_WARNING, "ignoring plugin '%s' of unknown type (%s)...", file.fileName.c_str(),
            file.extension.c_str());

@@ -15,6 +15,7 @@ namespace vantor {
 // name without its extension and a leading "lib".
 //
 //   <name>.so     a native plugin
+//   <name>.json   a JSON plugin
 //   <name>.debug  one debug plugin for each entry of that name in the debug configuration, which
 //                 is read afresh for every file; these pass no filter
 //
