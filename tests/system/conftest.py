@@ -10,16 +10,24 @@ import pytest
 sys.dont_write_bytecode = True
 
 # pylint: disable=wrong-import-position
+from harness import stand_in_proc  # noqa: E402
 from harness.base_root import BaseRoot, BuildError, compile_program  # noqa: E402
 from harness.isolation import Isolation, IsolationError  # noqa: E402
 from harness.native_plugin import PluginFactory  # noqa: E402
 from harness.private_root import PrivateRoot  # noqa: E402
 from harness.runner import Run  # noqa: E402
 from harness.sanitizers import Sanitizers  # noqa: E402
+from harness.terminal import Terminal  # noqa: E402
 
 _HERE = os.path.dirname(os.path.abspath(__file__))
 _PROGRAMS = os.path.join(_HERE, "harness", "programs")
 _notices = []
+
+# Where the program writes and reads; the machine's own must stay as they are.
+REAL_PATHS = [
+    "/bootbank", "/etc/nuvex", "/usr/libexec/vantor", "/usr/lib/nuvex", "/var/run/nuvex",
+    "/var/log/sysboot.log", "/etc/init.d/nvevtd",
+]
 
 
 class Session:
@@ -28,19 +36,32 @@ class Session:
     def __init__(self, folder):
         build = os.environ.get("VANTOR_BUILD_DIR", os.path.join(_HERE, "..", "..", "build/default"))
         self._folder, self._count = folder, 0
+        # From here on this process sees mounts of its own.
+        self.isolation = Isolation(os.environ.get("VANTOR_TEST_ISOLATION", ""))
+        # Where it can be, all of it lives in memory: quick, and gone with this process.
+        self.isolation.mount_tmpfs(folder)
         self.base = BaseRoot(os.path.join(folder, "base"), os.path.realpath(build))
         self.base.add_program(os.path.join(_PROGRAMS, "witness.c"), "usr/bin/witness")
         self.enter = os.path.join(folder, "enter")
         compile_program(os.path.join(_PROGRAMS, "enter.c"), self.enter)
         PluginFactory.open(os.path.join(folder, "plugins"))
-        # From here on this process sees mounts of its own.
-        self.isolation = Isolation(os.environ.get("VANTOR_TEST_ISOLATION", ""))
-        self.sanitizers = Sanitizers(self.base.sanitizers, self.isolation, folder)
+        self.sanitizers = Sanitizers(self.base.sanitizers, self.isolation.has_proc)
+        self._probe()
+
+    def _probe(self):
+        """Runs what must be known of the machine before the first test."""
+        root = self.new_root()
+        try:
+            self.sanitizers.probe_leaks(
+                root, lambda program: Run(root, self, [], program=program).wait_unchecked())
+        finally:
+            root.remove_all()
 
     def new_root(self):
         self._count += 1
         root = PrivateRoot(self.base, self.isolation, os.path.join(self._folder, str(self._count)))
-        self.sanitizers.prepare(root)
+        if self.sanitizers.needs_stand_in_proc:
+            stand_in_proc.lay_out(root, self.sanitizers.environment())
         return root
 
 
@@ -56,10 +77,12 @@ def session():
     folder = tempfile.mkdtemp(prefix="vantor-")
     try:
         made = Session(folder)
+        before = [os.path.lexists(path) for path in REAL_PATHS]
         _notices.append(f"isolation: {made.isolation.way}")
         if made.sanitizers.notice:
             _notices.append(f"leaks are NOT looked for: {made.sanitizers.notice}")
         yield made
+        assert before == [os.path.lexists(path) for path in REAL_PATHS], "the machine was touched"
     except (BuildError, IsolationError) as error:
         pytest.exit(f"no system test can run: {error}", returncode=3)
     finally:
@@ -71,28 +94,33 @@ def root(session, request):
     """A host of its own for one test."""
     made = session.new_root()
     request.node.private_root = made
-    yield made
-    made.remove_all()
+    try:
+        yield made
+    finally:
+        for run in made.runs:
+            run.abandon()
+        made.remove_all()
 
 
 @pytest.fixture
 def start(session, root):
     """start(argument..., **how) begins a run of the program; see Run."""
-    runs = []
-
-    def begin(*arguments, **how):
-        runs.append(Run(root, session, arguments, **how))
-        return runs[-1]
-
-    yield begin
-    for run in runs:
-        run.kill()
+    return lambda *arguments, **how: Run(root, session, arguments, **how)
 
 
 @pytest.fixture
 def vantor(start):
     """vantor(argument..., **how) runs the program to its end and returns the Result."""
     return lambda *arguments, **how: start(*arguments, **how).wait()
+
+
+@pytest.fixture
+def terminal(request):
+    """A pseudo-terminal for interactive runs; its transcript is kept for a failed test's report."""
+    made = Terminal()
+    request.node.terminal = made
+    yield made
+    made.close()
 
 
 @pytest.hookimpl(hookwrapper=True)
@@ -103,7 +131,9 @@ def pytest_runtest_makereport(item):
     made = getattr(item, "private_root", None)
     if report.failed and report.when == "call" and made:
         for number, run in enumerate(made.runs, 1):
-            report.sections.append((f"run {number}", str(run)))
+            report.sections.append((f"run {number}", str(run.abandon())))
+        if hasattr(item, "terminal"):
+            report.sections.append(("terminal", repr(item.terminal.transcript())))
         report.sections.append(("system alerts", "\n".join(made.alerts())))
         report.sections.append(("/tmp/ran", "\n".join(made.ran())))
 

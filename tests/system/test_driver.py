@@ -1,6 +1,8 @@
-"""The course of a run: directories, selections, failures that end it, and what is written anyway."""
+"""The course of a run: directories, selections, failures, and what is written all the same."""
 
 import re
+
+import pytest
 
 from harness.messages import BOOT_FAILED, INVOKE_FAILED, NOT_ELF, linker_says, starting
 from harness.syslog_recorder import ERR, INFO, WARNING
@@ -49,9 +51,17 @@ def test_a_plugin_directory_that_is_a_file_is_explained(root, vantor):
     assert result.stderr.endswith(': Not a directory: "/tmp/plugins"\n')
 
 
-def test_threads_that_cannot_be_made_end_the_run(root, vantor):
+@pytest.fixture
+def no_threads(session):
+    """Limits under which no thread can be made."""
+    if "tsan" in session.sanitizers.names:
+        pytest.skip("the thread sanitizer does not start with such a stack limit")
+    return {"stack_size": MORE_THAN_FITS}
+
+
+def test_threads_that_cannot_be_made_end_the_run(root, vantor, no_threads):
     root.native("alpha")
-    result = vantor("--parallel", stack_size=MORE_THAN_FITS)
+    result = vantor("--parallel", **no_threads)
     reason = NO_THREAD.format(8)
     assert result.stderr == f"{BOOT_FAILED}Details:\n{reason}\n"
     assert result.messages == [(ERR, f"unhandled exception whilst enumerating plugins: {reason}")]
@@ -63,10 +73,9 @@ def test_threads_that_cannot_be_made_end_the_run(root, vantor):
     assert root.profiling_log()[1] == f"[{never} - {never}] sysboot: alpha"
 
 
-def test_a_failed_invocation_is_explained_and_not_logged(root, vantor):
+def test_a_failed_invocation_is_explained_and_not_logged(root, vantor, no_threads):
     root.native("alpha")
-    result = vantor("--invoke", "--method=start", "--plugin=libalpha.so",
-                    stack_size=MORE_THAN_FITS)
+    result = vantor("--invoke", "--method=start", "--plugin=libalpha.so", **no_threads)
     reason = NO_THREAD.format(1)
     assert result.stderr == f"{INVOKE_FAILED}Details:\n{reason}\n"
     assert result.messages == [(ERR, f"unhandled exception whilst enumerating plugins: {reason}")]

@@ -31,7 +31,8 @@ def test_the_process_of_the_pid_file_is_signalled(root, start, init, form):
     assert (result.status, result.stderr, result.messages) == (0, "", [])
 
 
-@pytest.mark.parametrize("form", ["", "\n", "pid {}\n", "x{}", "99999999999999999999", "4294967297"])
+@pytest.mark.parametrize("form", [
+    "", "\n", "pid {}\n", "x{}", "99999999999999999999", "4294967297"])
 def test_a_pid_file_without_a_process_id_signals_nobody(root, init, form):
     with SignalListener() as daemon:
         root.write(PID_FILE, form.format(daemon.pid))

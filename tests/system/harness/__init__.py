@@ -1,1 +1,1 @@
-"""What the system tests stand on: a private root, its syslog, its plugins, and runs of the program."""
+"""What the system tests stand on: private roots, their syslog, plugins, and runs in them."""

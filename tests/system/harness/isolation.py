@@ -10,6 +10,7 @@ VANTOR_TEST_ISOLATION=chroot|mount asks for one of them; without it the first th
 """
 
 import ctypes
+import errno
 import os
 import shutil
 import stat
@@ -80,7 +81,8 @@ class Isolation:
         if self.way != "mount":
             self.way = "chroot"
             if os.geteuid() != 0:
-                raise IsolationError(f"{reason or 'chroot was asked for'}, and only root can chroot")
+                raise IsolationError(
+                    f"{reason or 'chroot was asked for'}, and only root can chroot")
 
     @property
     def has_proc(self):
@@ -88,7 +90,7 @@ class Isolation:
         return self.way == "mount"
 
     def mount_proc(self, root):
-        """Shows this machine's /proc inside the root, its files of the kernel's settings read-only."""
+        """Shows this machine's /proc inside the root, the kernel's settings read-only."""
         target = os.path.join(root, "proc")
         _mount("/proc", target, None, MS_BIND | MS_REC)
         try:
@@ -98,11 +100,11 @@ class Isolation:
         except OSError:
             pass  # an extra safety only: nothing of ours writes there
 
-    def mount_tmpfs(self, folder, size):
-        """Puts a file system of `size` bytes over the folder; False where mounting is not allowed."""
+    def mount_tmpfs(self, folder, size="50%"):
+        """Puts a file system in memory over the folder; False where that is not allowed."""
         if self.way != "mount":
             return False
-        _mount("tmpfs", folder, "tmpfs", MS_NOSUID | MS_NODEV, f"size={size}")
+        _mount("tmpfs", folder, "tmpfs", 0, f"size={size},mode=755")
         return True
 
     def make_device(self, path, name):
@@ -114,7 +116,7 @@ class Isolation:
             return True
         except OSError as error:
             # ENXIO: /dev/tty works, but this process has no terminal.
-            if os.path.exists(path) and error.errno == 6:
+            if os.path.exists(path) and error.errno == errno.ENXIO:
                 return True
         if os.path.lexists(path):
             os.unlink(path)  # made, but of no use: the file system is mounted without devices
@@ -139,7 +141,7 @@ class Isolation:
 
     @staticmethod
     def remove_tree(folder):
-        """Removes a folder after undoing every mount below it, so that no removal reaches out of it.
+        """Undoes every mount at or below a folder and removes it: nothing outside is reached.
 
         A mount goes together with those inside it: an ordinary user may not take them one by one.
         """

@@ -9,6 +9,8 @@ BLAME = "This may be caused by a bad vantor plugin being installed on your syste
 BOOT_FAILED = "Failed to boot the system.  An unhandled error has occurred.  " + BLAME
 INVOKE_FAILED = "Activating plugins has failed. An unhandled error has occurred.  " + BLAME
 
+IRREGULAR = "not a regular file"
+TRUNCATED = "file is truncated (a loadable segment lies beyond its end)"
 NOT_ELF = "This is no shared object, whatever its name may promise.\n" * 4
 
 

@@ -5,9 +5,10 @@ import gzip
 import os
 import shutil
 import signal
+import socket
 
 from harness.isolation import DEVICES
-from harness.native_plugin import write_native_plugin
+from harness.native_plugin import PluginFactory, write_native_plugin
 from harness.syslog_recorder import SyslogRecorder
 from harness.waiting import wait_until
 
@@ -65,6 +66,9 @@ class PrivateRoot:
         os.makedirs(os.path.dirname(self.path(name)), exist_ok=True)
         os.link(self.path(program), self.path(name))
 
+    def symlink(self, target, name):
+        os.symlink(target, self.path(name))
+
     def fifo(self, name):
         os.mkfifo(self.path(name))
 
@@ -80,19 +84,36 @@ class PrivateRoot:
             os.unlink(path)
 
     def read(self, name):
-        """The text of a file, "" when it is missing."""
+        """The text of a file, "" when there is no such file."""
         try:
             with open(self.path(name), encoding="utf-8", newline="") as file:
                 return file.read()
-        except FileNotFoundError:
+        except (FileNotFoundError, NotADirectoryError, IsADirectoryError):
             return ""
 
     def mode(self, name):
         return os.stat(self.path(name)).st_mode & 0o7777
 
-    def native(self, name, **description):
+    def native(self, name, file_name=None, **description):
         """Writes lib<name>.so into the plugin directory; see write_native_plugin()."""
-        write_native_plugin(self.path(f"{PLUGINS}/lib{name}.so"), name, **description)
+        file_name = file_name or f"lib{name}.so"
+        write_native_plugin(self.path(f"{PLUGINS}/{file_name}"), name, **description)
+
+    def compiled(self, name, text, language="c", *options):
+        """Compiles the text into lib<name>.so of the plugin directory."""
+        content = PluginFactory.compile(text, language, *options)
+        self.write(f"{PLUGINS}/lib{name}.so", content, 0o755)
+
+    def device(self, name, kind):
+        """Makes a device file; False where that is not allowed."""
+        return self.isolation.make_device(self.path(name), kind)
+
+    def socket(self, name):
+        """Makes a socket that nobody listens at."""
+        folder = os.open(os.path.dirname(self.path(name)), os.O_PATH | os.O_DIRECTORY)
+        with socket.socket(socket.AF_UNIX, socket.SOCK_STREAM) as made:
+            made.bind(f"/proc/self/fd/{folder}/{os.path.basename(name)}")
+        os.close(folder)
 
     def debug_configuration(self, *lines):
         self.write(DEBUG_CONFIGURATION, "".join(line + "\n" for line in lines))
@@ -122,7 +143,8 @@ class PrivateRoot:
 
     def started(self):
         """The names of the native plugins whose start method ran, in that order."""
-        return [line.split()[1] for line in self.ran() if line.startswith("start ")]
+        lines = [line for line in self.ran() if line.startswith("start ")]
+        return [line[len("start "):].rpartition(" ")[0] for line in lines]
 
     def alerts(self):
         """The texts of the system alerts, without their times."""
@@ -130,7 +152,7 @@ class PrivateRoot:
 
     def run_once_record(self):
         """The content of the run-once record; fails when it is no whole gzip file."""
-        with gzip.open(self.path(RUN_ONCE_RECORD), "rt", encoding="ascii", newline="") as file:
+        with gzip.open(self.path(RUN_ONCE_RECORD), "rt", encoding="utf-8", newline="") as file:
             return file.read()
 
     def profiling_log(self):

@@ -1,11 +1,9 @@
 """Runs of the program inside a private root."""
 
-import os
-import signal
 import subprocess
 from dataclasses import dataclass, field
 
-from harness import sanitizers
+from harness import sanitizers, stand_in_proc
 from harness.streams import PipeRecorder
 from harness.waiting import LIMIT_SECONDS, all_threads_asleep, is_asleep, wait_until
 
@@ -68,10 +66,18 @@ class Run:
             stdin=subprocess.DEVNULL if stdin is None else stdin,
             stdout=self._pipes[0].write_end if stdout is None else stdout,
             stderr=self._pipes[1].write_end, env=variables)
-        self.pid = self._process.pid
+        self.pid, self._result = self._process.pid, None
+        root.runs.append(self)
+        if session.sanitizers.needs_stand_in_proc:
+            stand_in_proc.complete(root, self.pid)
 
     def stdout_so_far(self):
         return self._pipes[0].so_far()
+
+    def reads(self):
+        """How many read calls the program has made."""
+        with open(f"/proc/{self.pid}/io", encoding="ascii") as file:
+            return int(dict(line.split(": ") for line in file)["syscr"])
 
     def has_ended(self):
         return self._process.poll() is not None
@@ -98,23 +104,27 @@ class Run:
 
     def wait(self):
         """The result; fails when the program hangs or its sanitizer reports anything."""
-        try:
-            status = self._process.wait(LIMIT_SECONDS)
-        except subprocess.TimeoutExpired:
-            status = None
-            self.kill()
-        result = Result(self._command, status, self._pipes[0].take(), self._pipes[1].take(),
-                        self._root.syslog.take())
-        for pipe in self._pipes:
-            pipe.close()
-        self._root.runs.append(result)
-        if status is None:
-            raise AssertionError(f"the program hangs\n{result}")
-        sanitizers.check(status, result.stderr)
+        result = self.wait_unchecked()
+        sanitizers.check(result.status, result.stderr)
         return result
 
-    def kill(self):
-        """Ends the program at once; its children are the root's to end."""
+    def wait_unchecked(self):
+        """As wait(), with sanitizer reports left in the result."""
+        try:
+            return self._collect(self._process.wait(LIMIT_SECONDS))
+        except subprocess.TimeoutExpired:
+            raise AssertionError(f"the program hangs\n{self.abandon()}") from None
+
+    def abandon(self):
+        """Ends the program at once, its children being the root's to end; the result so far."""
         if not self.has_ended():
-            os.kill(self.pid, signal.SIGKILL)
-            self._process.wait()
+            self._process.kill()
+        return self._collect(self._process.wait())
+
+    def _collect(self, status):
+        if self._result is None:
+            self._result = Result(self._command, status, self._pipes[0].take(),
+                                  self._pipes[1].take(), self._root.syslog.take())
+            for pipe in self._pipes:
+                pipe.close()
+        return self._result

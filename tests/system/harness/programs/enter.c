@@ -7,6 +7,7 @@
  *   -l NUMBER   a descriptor of that number is left open for the program (repeatable)
  *   -g          lead a process group of its own, so that no new session can be made
  *   -a          without address space randomisation
+ *   -p          stop when the program has been executed, for the parent to let it go (ptrace)
  *
  * 125 is the status of every failure before the program runs.
  */
@@ -19,6 +20,7 @@
 #include <stdlib.h>
 #include <string.h>
 #include <sys/personality.h>
+#include <sys/ptrace.h>
 #include <sys/resource.h>
 #include <unistd.h>
 
@@ -78,8 +80,8 @@ static void LeakDescriptor(const char* number) {
 
 int main(int argc, char** argv) {
     const char* folder = "/";
-    int option;
-    while ((option = getopt(argc, argv, "+c:f:n:s:l:ga")) != -1) {
+    int option, traced = 0;
+    while ((option = getopt(argc, argv, "+c:f:n:s:l:gap")) != -1) {
         switch (option) {
         case 'c':
             folder = optarg;
@@ -103,6 +105,9 @@ int main(int argc, char** argv) {
             /* Where a container forbids it the program runs as it is. */
             (void)personality(ADDR_NO_RANDOMIZE);
             break;
+        case 'p':
+            traced = 1;
+            break;
         default:
             return 125;
         }
@@ -113,6 +118,9 @@ int main(int argc, char** argv) {
     }
     if (chroot(argv[optind]) != 0 || chdir(folder) != 0) {
         Fail(argv[optind]);
+    }
+    if (traced && ptrace(PTRACE_TRACEME, 0, NULL, NULL) != 0) {
+        Fail("ptrace");
     }
     execv(argv[optind + 1], argv + optind + 1);
     Fail(argv[optind + 1]);
