@@ -105,7 +105,7 @@ void Reader::Blanks() {
         if (!Accept('/')) {
             return;
         }
-        if (Accept('*')) {
+        if (Peek() == '*') {
             BlockComment();
         } else if (Accept('/')) {
             LineComment();
@@ -115,6 +115,7 @@ void Reader::Blanks() {
     }
 }
 
+// Stands before the star behind the opening slash, which may end the comment too.
 void Reader::BlockComment() {
     while (Good()) {
         if (Take() == '*' && Accept('/')) {
@@ -252,7 +253,12 @@ void Reader::List(char open, char close, Item item) {
 
 void Reader::Object(std::map<std::string, JsonValue>& members) {
     std::map<std::string, JsonValue> collected;
-    List('{', '}', [this, &collected] { Member(collected); });
+    try {
+        List('{', '}', [this, &collected] { Member(collected); });
+    } catch (...) {
+        members = std::move(collected);
+        throw;
+    }
     members = std::move(collected);
 }
 

@@ -12,7 +12,7 @@ namespace vantor {
 
 // Reads JSON (RFC 8259) from a byte stream, one value at a time, leaving what follows it in the
 // stream. More lenient than the RFC in these ways and no other:
-//   - "/* */" and "//" comments stand wherever white space may;
+//   - "/* */" and "//" comments stand wherever white space may, and "/*/" is a whole comment;
 //   - in an object or array a comma may follow the opening bracket, or another comma, at once, and
 //     a last comma may stand before the closing bracket;
 //   - of equal keys the last one wins;

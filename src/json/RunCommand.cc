@@ -3,6 +3,7 @@
 #include <syslog.h>
 
 #include <boost/shared_ptr.hpp>
+#include <list>
 #include <vector>
 
 #include "platform/BaseKit.h"
@@ -30,9 +31,11 @@ void RunCommand(const std::string& command, const std::string& operation,
     }
     const boost::shared_ptr<CommandInput> input = CommandInput::New();
     const boost::shared_ptr<CommandOutput> output = CommandOutput::New();
+    const auto parameters = parser.GetCommandParameters();
+    const std::list<std::string> path = parser.GetCommandPath();
     input->SetCallerName("vantor");
-    input->SetCommandPath(parser.GetCommandPath());
-    for (const auto& [name, value] : parser.GetCommandParameters()) {
+    input->SetCommandPath(path);
+    for (const auto& [name, value] : parameters) {
         input->AddParameter(name, value);
     }
     NvcliDispatcher::Instance()->ExecuteCommand(input, output);
