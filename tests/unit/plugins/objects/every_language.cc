@@ -1,0 +1,1 @@
+#include "plugins/objects/every_language.h"
