@@ -54,7 +54,7 @@ class Host:
     def __init__(self, root, isolation, folder):
         self._root = root
         self._session = SimpleNamespace(
-            enter=os.path.join(folder, "enter"), sanitizers=Sanitizers([], isolation, folder))
+            enter=os.path.join(folder, "enter"), sanitizers=Sanitizers([], isolation.has_proc))
         programs = os.path.join(os.path.dirname(harness.__file__), "programs")
         compile_program(os.path.join(programs, "enter.c"), self._session.enter)
 

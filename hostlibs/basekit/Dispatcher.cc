@@ -54,6 +54,8 @@ Dispatcher::Dispatcher() { Storage::Put(hostStorage, std::make_unique<impl::Comm
 
 Dispatcher::~Dispatcher() { Storage::Release(hostStorage); }
 
+// The host library takes shared pointers by value.
+// NOLINTBEGIN(performance-unnecessary-value-param)
 bool Dispatcher::ExecuteCommand(boost::shared_ptr<CommandInput> input,
                                 boost::shared_ptr<CommandOutput> output) {
     const auto& recorded = OurOwn<const impl::RecordedInput>(
@@ -66,6 +68,7 @@ bool Dispatcher::ExecuteCommand(boost::shared_ptr<CommandInput> input,
 std::string Dispatcher::FormatOutput(boost::shared_ptr<CommandOutput> output) {
     return GetFormatter(impl::TextFormatter::name)->Format(AnswerOf(output));
 }
+// NOLINTEND(performance-unnecessary-value-param)
 
 std::vector<std::pair<std::string, std::string>> Dispatcher::GetDefaultOutputFormatParameters() {
     return {{"formatter", impl::TextFormatter::name}};

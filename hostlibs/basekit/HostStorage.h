@@ -12,9 +12,9 @@ namespace BaseKit::impl {
 template <typename State>
 class HostStorage {
 public:
-    template <std::size_t size>
-    static void Put(unsigned char (&storage)[size], std::unique_ptr<State> state) {
-        static_assert(sizeof(State*) <= size && alignof(State*) <= alignof(std::max_align_t));
+    template <std::size_t Size>
+    static void Put(unsigned char (&storage)[Size], std::unique_ptr<State> state) {
+        static_assert(sizeof(State*) <= Size && alignof(State*) <= alignof(std::max_align_t));
         new (storage) State*(state.release());
     }
 

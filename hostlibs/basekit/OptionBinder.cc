@@ -44,7 +44,7 @@ std::string CheckChoice(const std::string& value, const std::vector<std::string>
     }
     std::string known;
     for (const std::string& choice : choices) {
-        known += (known.empty() ? "" : ", ") + Quoted(choice);
+        known.append(known.empty() ? "" : ", ").append(Quoted(choice));
     }
     return "is not one of " + known;
 }
