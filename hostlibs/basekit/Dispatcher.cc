@@ -10,10 +10,10 @@
 #include "basekit/OutputFormatter.h"
 #include "platform/BaseKit.h"
 
-// What this library makes of the operations that only its own tools call. A plugin of the dispatcher
-// is a description file, named by its path, in a directory that is added or on its own; it stays
-// known for good. Registering makes the commands of a known file executable, which adding does
-// too, and a reset takes all commands away until then. The default directories are the host's
+// What this library makes of the operations that only its own tools call. A plugin of the
+// dispatcher is a description file, named by its path, in a directory that is added or on its own;
+// it stays known for good. Registering makes the commands of a known file executable, which adding
+// does too, and a reset takes all commands away until then. The default directories are the host's
 // four; one that does not exist is passed over. The one formatter is "text". All operations may be
 // called by any number of threads at once.
 namespace BaseKit::AutoCli {

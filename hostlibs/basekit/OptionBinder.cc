@@ -82,19 +82,22 @@ std::string CheckValue(const CommandOption& option, const std::string& typed,
                          : "the value " + Quoted(value) + " of the option " + typed + " " + wrong;
 }
 
+std::string Subject(const CommandDescription& command) {
+    return "the command " + Quoted(JoinPath(command.path));
+}
+
 }  // namespace
 
 BoundOptions BindOptions(const CommandDescription& command,
                          const std::vector<std::pair<std::string, std::string>>& parameters) {
     BoundOptions bound;
     bound.values.resize(command.options.size());
-    const std::string commandName = "the command " + Quoted(JoinPath(command.path));
 
     for (const auto& [name, value] : parameters) {
         const std::string typed = QuotedOption(name);
         const std::optional<std::size_t> index = FindByTypedName(command.options, name);
         if (!index.has_value()) {
-            bound.errors.push_back(commandName + " has no option " + typed);
+            bound.errors.push_back(Subject(command).append(" has no option ").append(typed));
             continue;
         }
         if (bound.values[*index].has_value()) {
@@ -110,7 +113,7 @@ BoundOptions BindOptions(const CommandDescription& command,
     }
     for (std::size_t i = 0; i < command.options.size(); ++i) {
         if (command.options[i].required && !bound.values[i].has_value()) {
-            bound.errors.push_back(commandName + " needs the option " +
+            bound.errors.push_back(Subject(command) + " needs the option " +
                                    QuotedOption(command.options[i].name));
         }
     }

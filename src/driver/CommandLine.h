@@ -21,8 +21,8 @@ struct DriverOptions {
     std::optional<std::string> dumpPath;  // where to; without one the drawing goes nowhere
 };
 
-// Parses the command line by getopt_long(3) into `config` and `options`. Returns an exit status when
-// the program is to end at once: 0 after --help, 1 after an error, which has been explained on
+// Parses the command line by getopt_long(3) into `config` and `options`. Returns an exit status
+// when the program is to end at once: 0 after --help, 1 after an error, which has been explained on
 // standard error; otherwise nothing. Called once, by the main thread, before any other exists.
 std::optional<int> ParseCommandLine(int argc, char** argv, RunConfig& config,
                                     DriverOptions& options);

@@ -13,8 +13,8 @@
 namespace vantor {
 
 // One run of the program, from the parsed command line to the exit status: brings up the init-mode
-// services, gathers the plugins, draws or runs their graph and leaves the reports behind. Used once,
-// by the main thread; the workers live only within Work().
+// services, gathers the plugins, draws or runs their graph and leaves the reports behind. Used
+// once, by the main thread; the workers live only within Work().
 class MainDriver {
 public:
     // Takes the start time and parses the command line.

@@ -24,7 +24,8 @@ void FormatProfilingLog(std::ostream& stream, const timeval& startTime, const ti
                         std::uint64_t uptimeSeconds, const PluginQueue& nodes,
                         const RunConfig& config);
 
-// Writes a time as UTC, "2024-03-05 07:08:09.000042". The stream's fill character is '0' afterwards.
+// Writes a time as UTC, "2024-03-05 07:08:09.000042". The stream's fill character is '0'
+// afterwards.
 std::ostream& FormatTime(std::ostream& stream, const timeval& time);
 
 }  // namespace vantor

@@ -22,8 +22,8 @@ class Node;
 class Executor {
 public:
     // Starts `threadCount` workers; none when it is below 1, and then no node is ever run. With
-    // `randomizeEquals`, equals are drawn by rand(), which nothing seeds: every run draws the same. Throws
-    // Exception, with no worker left behind, when the pool cannot be built whole.
+    // `randomizeEquals`, equals are drawn by rand(), which nothing seeds: every run draws the same.
+    // Throws Exception, with no worker left behind, when the pool cannot be built whole.
     Executor(std::int32_t threadCount, bool randomizeEquals);
 
     Executor(const Executor&) = delete;

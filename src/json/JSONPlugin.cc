@@ -36,8 +36,8 @@ JsonValue ReadDocument(const std::string& path) {
     return root;
 }
 
-// Truncated toward zero. Every number that no version has is as good as 0, so that none is converted
-// that a 32-bit integer cannot hold.
+// Truncated toward zero. Every number that no version has is as good as 0, so that none is
+// converted that a 32-bit integer cannot hold.
 std::int32_t ToVersion(double number) {
     const bool known = number >= oldestVersion && number < newestVersion + 1.0;
     return known ? static_cast<std::int32_t>(number) : 0;

@@ -28,7 +28,8 @@ namespace vantor {
 // thrown by the reader or logged. Each function takes time in proportion to the bytes it reads, and
 // memory in proportion to the value. They may be called by several threads on different streams.
 
-// Reads a value of any kind. `value` gets its kind only when the read succeeds; give it a fresh one.
+// Reads a value of any kind. `value` gets its kind only when the read succeeds; give it a fresh
+// one.
 void ReadValue(std::istream& stream, JsonValue& value);
 
 // Replaces `members` also after a failure, by what was read until then.

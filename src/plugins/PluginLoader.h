@@ -21,8 +21,8 @@ namespace vantor {
 //
 // A plugin that a filter keeps out has been constructed all the same: it stays in the graph, marked
 // done, so that its barriers count as provided. A run-once plugin that has already run is marked
-// done and queued. `runOnceRecord` gains the keys of the run-once plugins that will run. A file that
-// cannot be used is skipped; what is wrong with it goes to syslog and becomes a system alert.
+// done and queued. `runOnceRecord` gains the keys of the run-once plugins that will run. A file
+// that cannot be used is skipped; what is wrong with it goes to syslog and becomes a system alert.
 //
 // Called by one thread before any worker exists. Of `config` only `pluginDirectory` is read.
 void LoadPlugin(const std::string& fileName, PluginQueue& plugins,

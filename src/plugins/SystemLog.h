@@ -5,9 +5,9 @@
 
 namespace vantor {
 
-// Logs `text` as syslog(3) would with `text` as its format and no further argument, where that means
-// anything: "%%" becomes a percent sign and "%m" the text of `error`, an errno value. Every other
-// conversion would want an argument that is not there and stays as it is written.
+// Logs `text` as syslog(3) would with `text` as its format and no further argument, where that
+// means anything: "%%" becomes a percent sign and "%m" the text of `error`, an errno value. Every
+// other conversion would want an argument that is not there and stays as it is written.
 void LogFormat(int priority, const std::string& text, int error);
 
 }  // namespace vantor

@@ -102,10 +102,7 @@ TEST_P(LaunchTest, DoesNothingAndReportsNothingWhenThereIsNoChild) {
 
 INSTANTIATE_TEST_SUITE_P(Services, LaunchTest,
                          ::testing::Values(Service{&LaunchSyslogDaemon, syslogDaemon, "-i"},
-                                           Service{&StartEventDaemon, eventDaemonScript, "start"}),
-                         [](const auto& service) {
-                             return service.index == 0 ? "SyslogDaemon" : "EventDaemon";
-                         });
+                                           Service{&StartEventDaemon, eventDaemonScript, "start"}));
 
 TEST_F(InitServicesTest, ALogDaemonThatCannotBeExecutedIsReportedOnStandardError) {
     LaunchSyslogDaemon();

@@ -21,7 +21,9 @@ struct FormatCase {
     const char* logged;
 };
 
-void PrintTo(const FormatCase& value, std::ostream* stream) { *stream << ::testing::PrintToString(value.text); }
+void PrintTo(const FormatCase& value, std::ostream* stream) {
+    *stream << ::testing::PrintToString(value.text);
+}
 
 class LogFormatTest : public ::testing::TestWithParam<FormatCase> {};
 
