@@ -11,6 +11,11 @@ if(VANTOR_WERROR)
     add_compile_options(-Werror)
 endif()
 
+# On 32 bits too, files may be large, have large inode numbers and be of the time after 2038.
+if(CMAKE_SIZEOF_VOID_P EQUAL 4)
+    add_compile_definitions(_FILE_OFFSET_BITS=64 _TIME_BITS=64)
+endif()
+
 add_compile_options(-fstack-protector-strong)
 add_link_options(-Wl,-z,relro -Wl,-z,now)
 

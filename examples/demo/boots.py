@@ -64,3 +64,7 @@ class Host:
             wait_until(lambda: "read again" in self._root.read(sample_host.SERVICES),
                        "the log daemon reads its configuration again")
         return Boot(result, self._root)
+
+    def by_hand(self, *words):
+        """What nvcli makes of a command line: a Result."""
+        return Run(self._root, self._session, words, program="/usr/bin/nvcli").wait()

@@ -6,6 +6,7 @@ private root is gone afterwards, the drawn graph stays.
 
 import os
 import pathlib
+import shlex
 import signal
 import sys
 import tempfile
@@ -48,6 +49,31 @@ def show_boot(boot, root):
     show("What the services were asked to do", boot.services)
 
 
+def show_json(root):
+    """What the commands of the JSON plugins left."""
+    for name in (*facts.SETTING_FILES, sample_host.JOURNAL, f"{sample_host.STATE}/routes"):
+        show(f"Changed by commands of JSON plugins: {name}", root.read(name).splitlines())
+
+
+def by_hand(host, *words):
+    """Runs nvcli and shows all that it says; a Result."""
+    result = host.by_hand(*words)
+    show(f"By hand: {shlex.join(('nvcli', *words))} (exit status {result.status})",
+         (result.stdout + result.stderr).splitlines())
+    return result
+
+
+def show_nvcli(root, host):
+    """The facts of an administrator's tries with the commands that the plugins use."""
+    listed = by_hand(host)
+    helped = by_hand(host, "network", "route", "load", "--help")
+    by_hand(host, "system", "setting", "set", "--name=motd", "--value=Set by hand")
+    settings = by_hand(host, "system", "setting", "list")
+    failed = by_hand(host, "network", "route", "load", "--table=guests")
+    mistyped = by_hand(host, "network", "route", "lode", "--table=uplink")
+    return facts.of_nvcli(listed, helped, settings, failed, mistyped, root)
+
+
 def show_graph(root):
     """Draws the dump below build/demo; the graph, read."""
     dump, picture = KEPT / "graph.dot", KEPT / "graph.svg"
@@ -60,23 +86,28 @@ def show_graph(root):
 
 
 def run_demo(root, isolation, folder):
-    """The facts of all three runs."""
+    """The facts of all runs."""
     sample_host.lay_out(root, sample_host.compile_plugins(os.path.join(folder, "plugins")))
     host = boots.Host(root, isolation, folder)
 
     first = host.run("--init", "--parallel", "--trace")
     show_boot(first, root)
+    show_json(root)
     dumped = host.run("--dump-dependency-tree=/tmp/graph.dot")
     graph = show_graph(root)
-    found = [*facts.of_first_boot(first, graph, root), *facts.of_graph(dumped, graph)]
+    found = [*facts.of_first_boot(first, graph, root), *facts.of_commands(first, root),
+             *facts.of_graph(dumped, graph)]
 
     root.write(HOST_PROFILE, "<profile/>\n")
     recorded = first.record.strip().partition("=")[2]
-    second = host.run("--parallel", "--trace", f"--run-once={recorded}")
-    show(f"The next boot, with a host profile: vantor --parallel --trace --run-once={recorded}",
+    options = ["--parallel", "--trace", "--plugin-flags=noroutes", f"--run-once={recorded}"]
+    second = host.run(*options)
+    show(f"The next boot, with a host profile: vantor {' '.join(options)}",
          second.output.splitlines())
     show("Its syslog messages", syslog_lines(second.messages))
-    return found + list(facts.of_second_boot(second, root))
+    show_json(root)
+    found += [*facts.of_second_boot(second, root), *facts.of_next_commands(second, first, root)]
+    return found + list(show_nvcli(root, host))
 
 
 def main():

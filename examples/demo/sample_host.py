@@ -10,13 +10,24 @@ PLUGINS = "/usr/libexec/vantor/plugins"
 STATE = "/var/run/sample-host"
 SERVICES = "/var/log/services"
 PID_FILE = "/var/run/nuvex/nvsyslogd.pid"
+SETTINGS = "/etc/sample-host/settings"
+JOURNAL = "/var/lib/sample-host/journal"
+# Where each file of command descriptions goes; the framework looks into all four folders.
+DESCRIPTIONS = {
+    "/usr/lib/nuvex/nvcli": ["system.json"],
+    "/usr/lib/nuvex/nvcli/int": [],
+    "/usr/lib/nuvex/nvcli/int/ext": [],
+    "/usr/lib/nuvex/nvcli/ext": ["network.json"],
+}
 
 # Which plugins of examples/ a barrier puts before which others.
 ORDERS = """
-boot-note -> datastore identity disk-probe network
-storage -> datastore identity disk-probe
+boot-note -> datastore identity disk-probe network folders
+storage -> datastore identity disk-probe folders
 nics -> network
-network -> firewall clock links-before-firewall
+network -> firewall clock links-before-firewall routes
+folders -> settings routes
+settings -> first-boot
 datastore disk-probe firewall links-before-firewall identity -> management
 management sensors -> inventory
 """
@@ -68,9 +79,24 @@ def lay_out(root, plugins):
     root.write(f"{PLUGINS}/README", "Plugins of the sample host.\n")
     root.write("/etc/nuvex/vantor/debug.conf",
                (EXAMPLES / "debug" / "debug.conf").read_text(encoding="utf-8"))
+    lay_out_json(root)
     root.write("/etc/syslog.conf", "*.* /var/log/messages\n")
     root.folder_at(STATE)
     root.script("/usr/lib/nuvex/nvsyslog/bin/nvsyslogd", LOG_DAEMON)
     root.script("/usr/lib/nuvex/nvsyslog/bin/upgrade-syslog.conf.sh",
                 f'echo "upgrade-syslog.conf.sh: run" >> {SERVICES}')
     root.script("/etc/init.d/nvevtd", f'echo "nvevtd: called with \'$*\'" >> {SERVICES}')
+
+
+def lay_out_json(root):
+    """The plugin documents, and what makes their commands work."""
+    source = EXAMPLES / "json"
+    for document in sorted(source.glob("plugins/*.json")):
+        root.write(f"{PLUGINS}/{document.name}", document.read_bytes())
+    for folder, names in DESCRIPTIONS.items():
+        os.makedirs(root.path(folder), exist_ok=True)
+        for name in names:
+            root.write(f"{folder}/{name}", (source / "commands" / name).read_bytes())
+    for table in source.glob("tables/*"):
+        root.write(f"/etc/sample-host/tables/{table.name}", table.read_bytes())
+    root.write("/usr/libexec/sample-host/load-routes", (source / "load-routes").read_bytes(), 0o755)

@@ -130,12 +130,19 @@ std::vector<option> LongOptions() {
 
 std::optional<int> ParseCommandLine(int argc, char** argv, RunConfig& config,
                                     DriverOptions& options) {
+    // A leading "-" hands over words that are no options, as code 1, instead of letting the
+    // environment decide whether they end the parsing.
+    constexpr const char* shortOptions = "-h";
+    constexpr int plainWord = 1;
     const std::vector<option> longOptions = LongOptions();
     int code = 0;
-    while ((code = getopt_long(argc, argv, "h", longOptions.data(), nullptr)) != -1) {
+    while ((code = getopt_long(argc, argv, shortOptions, longOptions.data(), nullptr)) != -1) {
         if (code == '?') {
             std::cerr << "usage: " << argv[0] << " --help for usage information" << std::endl;
             return EXIT_FAILURE;
+        }
+        if (code == plainWord) {
+            continue;
         }
         const OptionRule& rule = code == 'h' ? rules[0] : rules[code - firstCode];
         if (rule.apply == nullptr) {

@@ -29,7 +29,8 @@ enum class NodeState : std::int32_t {
 // There is no way back and no state for failure: what became of a plugin's method is the plugin's
 // own record. All state and both lists are guarded by GlobalLock, which every operation takes
 // itself unless it says otherwise; calling them with the lock held is allowed. Edges are added only
-// before any worker exists. Nothing looks for cycles: a node on one is never run.
+// before any worker exists. Nothing looks for cycles: a node on one is never run, and computing the
+// height of a node from which one is reached ends with the stack.
 class Node {
 public:
     // Throws Exception when the condition variable cannot be initialised.

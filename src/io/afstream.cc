@@ -120,6 +120,9 @@ void afstream::FlushToDisk() {
     }
     // The stream does not give its descriptor away; any descriptor of the file synchronises it.
     FileDescriptor file(::open(tempName.c_str(), O_RDONLY | O_CLOEXEC | O_NOCTTY));
+    if (!file.IsOpen() && errno == ENOENT) {
+        return;  // nothing to synchronise: already committed, or taken away; the rename says so
+    }
     if (!file.IsOpen() || fsync(file.Get()) != 0) {
         const int syncError = errno;
         Discard();

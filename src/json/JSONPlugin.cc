@@ -4,9 +4,9 @@
 #include <fstream>
 #include <utility>
 
-#include "plugins/Exceptions.h"
 #include "json/JsonReader.h"
 #include "json/RunCommand.h"
+#include "plugins/Exceptions.h"
 
 namespace vantor {
 

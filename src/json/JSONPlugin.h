@@ -4,8 +4,8 @@
 #include <list>
 #include <string>
 
-#include "plugins/Plugin.h"
 #include "json/JsonValue.h"
+#include "plugins/Plugin.h"
 
 namespace vantor {
 

@@ -6,8 +6,8 @@
 #include <list>
 #include <vector>
 
-#include "platform/BaseKit.h"
 #include "json/NvcliDispatcher.h"
+#include "platform/BaseKit.h"
 
 namespace vantor {
 

@@ -9,11 +9,11 @@
 #include "driver/DebugConfig.h"
 #include "graph/KeepUntilExit.h"
 #include "graph/SystemAlert.h"
+#include "json/JSONPlugin.h"
 #include "plugins/DebugPlugin.h"
 #include "plugins/NativePlugin.h"
 #include "plugins/PluginFilters.h"
 #include "plugins/SystemLog.h"
-#include "json/JSONPlugin.h"
 
 namespace vantor {
 

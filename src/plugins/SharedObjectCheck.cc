@@ -6,6 +6,7 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <cstdint>
 #include <cstring>
 
@@ -15,21 +16,41 @@ namespace vantor {
 
 namespace {
 
-constexpr unsigned char wordClass = sizeof(void*) == 4 ? ELFCLASS32 : ELFCLASS64;
+static_assert(sizeof(off_t) == 8, "a large file would be taken for an unreadable one");
+
+// This program's own header, put there by the linker: what kind of object this process can load.
+// NOLINTNEXTLINE(bugprone-reserved-identifier,readability-identifier-naming): the linker's name
+extern "C" const ElfW(Ehdr) __ehdr_start __attribute__((visibility("hidden")));
 
 // Reads `size` bytes at `offset`; false when the file does not hold them.
 bool ReadAt(int file, void* buffer, std::size_t size, std::uint64_t offset) {
     return pread(file, buffer, size, static_cast<off_t>(offset)) == static_cast<ssize_t>(size);
 }
 
-// The linker refuses other headers before it maps anything.
-bool IsLoadable(const ElfW(Ehdr) & header) {
-    return std::memcmp(header.e_ident, ELFMAG, SELFMAG) == 0 &&
-           header.e_ident[EI_CLASS] == wordClass && header.e_phentsize == sizeof(ElfW(Phdr));
+bool HasIdentOfThisProcess(const unsigned char (&ident)[EI_NIDENT]) {
+    const unsigned char* const own = __ehdr_start.e_ident;
+    if (std::memcmp(ident, own, EI_OSABI) != 0) {  // the magic, word size, byte order and version
+        return false;
+    }
+    const bool plainAbi = ident[EI_OSABI] == ELFOSABI_SYSV && ident[EI_ABIVERSION] == 0;
+    if (!plainAbi && ident[EI_OSABI] != ELFOSABI_GNU) {
+        return false;
+    }
+    return std::all_of(ident + EI_PAD, ident + EI_NIDENT,
+                       [](unsigned char padding) { return padding == 0; });
 }
 
+// The linker refuses every other header in its own words, before it maps anything.
+bool IsLoadable(const ElfW(Ehdr) & header) {
+    return HasIdentOfThisProcess(header.e_ident) && header.e_type == ET_DYN &&
+           header.e_machine == __ehdr_start.e_machine && header.e_version == EV_CURRENT &&
+           header.e_phentsize == sizeof(ElfW(Phdr));
+}
+
+// A segment without bytes of the file, all zeros, may start anywhere.
 bool LiesInside(const ElfW(Phdr) & segment, std::uint64_t fileSize) {
-    return segment.p_offset <= fileSize && segment.p_filesz <= fileSize - segment.p_offset;
+    return segment.p_filesz == 0 ||
+           (segment.p_offset <= fileSize && segment.p_filesz <= fileSize - segment.p_offset);
 }
 
 bool IsCutShort(int file, std::uint64_t fileSize) {
@@ -55,7 +76,13 @@ std::string ReasonNotToLoad(const std::string& path) {
     // O_PATH names the file without opening it: opening a device can already have an effect.
     const FileDescriptor location(open(path.c_str(), O_PATH | O_CLOEXEC));
     struct stat status {};
-    if (!location.IsOpen() || fstat(location.Get(), &status) != 0 || S_ISDIR(status.st_mode)) {
+    if (!location.IsOpen()) {
+        return {};
+    }
+    if (fstat(location.Get(), &status) != 0) {
+        return "its file status cannot be read";
+    }
+    if (S_ISDIR(status.st_mode)) {
         return {};
     }
     if (!S_ISREG(status.st_mode)) {

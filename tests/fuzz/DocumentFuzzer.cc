@@ -14,8 +14,8 @@
 #include "fuzz/PlainReader.h"
 #include "fuzz/ReadingComparison.h"
 #include "graph/InitBarrier.h"
-#include "plugins/Exceptions.h"
 #include "json/JSONPlugin.h"
+#include "plugins/Exceptions.h"
 
 namespace {
 

@@ -5,7 +5,8 @@ import re
 import shutil
 import subprocess
 
-TOOLS = ["sh", "sleep", "cat", "echo", "ls", "kill", "true", "false", "touch"]
+TOOLS = ["sh", "sleep", "cat", "echo", "ls", "kill", "true", "false", "touch",
+         "mkdir"]
 FOLDERS = [
     "etc/nuvex/vantor", "etc/init.d", "usr/libexec/vantor/plugins", "usr/lib/nuvex/nvsyslog/bin",
     "usr/sbin", "usr/bin", "var/log", "var/run/nuvex", "bootbank", "dev", "tmp", "proc",
@@ -69,6 +70,10 @@ class BaseRoot:
             found = shutil.which(name, path="/usr/bin:/bin")
             if found:
                 self._add(found, "usr/bin/" + name)
+        # Not built where the host's own libraries take the place of ours.
+        nvcli = os.path.join(self.build, "bin", "nvcli")
+        if os.path.exists(nvcli):
+            self._add(nvcli, "usr/bin/nvcli")
 
     def _add(self, source, target):
         """Copies one file with all that it links to, each under the name it is looked for by."""

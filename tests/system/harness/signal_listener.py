@@ -4,6 +4,8 @@ import signal
 import subprocess
 import sys
 
+from harness.waiting import LIMIT_SECONDS
+
 _PROGRAM = """
 import signal
 expected = [signal.SIGUSR1, signal.SIGUSR2]
@@ -33,7 +35,7 @@ class SignalListener:
         A signal of our own marks the end: of several pending ones, the lowest number comes first.
         """
         self._process.send_signal(signal.SIGUSR2)
-        output, _ = self._process.communicate(timeout=120)
+        output, _ = self._process.communicate(timeout=LIMIT_SECONDS)
         lines = [line.split() for line in output.splitlines()]
         return [(name, int(sender)) for name, sender in lines if name != "SIGUSR2"]
 

@@ -4,6 +4,8 @@ import os
 import threading
 import uuid
 
+from harness.waiting import LIMIT_SECONDS
+
 
 class PipeRecorder:
     """Give `write_end` to a program; take() returns all that was written until then."""
@@ -34,7 +36,7 @@ class PipeRecorder:
         mark = uuid.uuid4().bytes
         os.write(self.write_end, mark)
         with self._arrived:
-            if not self._arrived.wait_for(lambda: mark in self._data, 120):
+            if not self._arrived.wait_for(lambda: mark in self._data, LIMIT_SECONDS):
                 raise AssertionError("the pipe does not drain")
             text, _, rest = bytes(self._data).partition(mark)
             self._data[:] = rest

@@ -7,6 +7,8 @@ import threading
 import uuid
 from dataclasses import dataclass
 
+from harness.waiting import LIMIT_SECONDS
+
 # Facility user is 1, and the priority's number is facility * 8 + severity.
 ERR, WARNING, INFO, DEBUG = 8 + 3, 8 + 4, 8 + 6, 8 + 7
 
@@ -38,7 +40,7 @@ class SyslogRecorder:
 
     def _drain(self):
         while True:
-            datagram = self._socket.recv(1 << 16)
+            datagram = self._socket.recv(1 << 18)
             if not datagram:
                 return
             with self._arrived:
@@ -60,7 +62,7 @@ class SyslogRecorder:
         mark = uuid.uuid4().bytes
         self._send(mark)
         with self._arrived:
-            if not self._arrived.wait_for(lambda: mark in self._received, 120):
+            if not self._arrived.wait_for(lambda: mark in self._received, LIMIT_SECONDS):
                 raise AssertionError("the system log does not drain")
             position = self._received.index(mark)
             datagrams = self._received[:position]

@@ -3,7 +3,7 @@
 import os
 import time
 
-LIMIT_SECONDS = 120
+LIMIT_SECONDS = 300
 
 
 def wait_until(condition, what):

@@ -4,6 +4,7 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
+#include <cstdlib>
 #include <iostream>
 #include <vector>
 
@@ -181,6 +182,13 @@ TEST_F(CommandLineTest, TheDumpPathIsTakenInTheAttachedFormOnly) {
     EXPECT_EQ(options.dumpPath, std::nullopt);
     ExpectRun({"--dump-dependency-tree=/tmp/g.dot"});
     EXPECT_EQ(options.dumpPath, "/tmp/g.dot");
+}
+
+TEST_F(CommandLineTest, NonOptionArgumentsAreIgnoredWhateverTheEnvironmentAsksOfTheParser) {
+    ASSERT_EQ(setenv("POSIXLY_CORRECT", "1", 1), 0);
+    ExpectRun({"word", "--trace"});
+    ASSERT_EQ(unsetenv("POSIXLY_CORRECT"), 0);
+    EXPECT_TRUE(config.trace);
 }
 
 TEST_F(CommandLineTest, NonOptionArgumentsAreIgnored) {

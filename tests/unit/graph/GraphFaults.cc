@@ -10,6 +10,7 @@ void GraphFaults::Reset() {
         fault->Reset();
     }
     draws.clear();
+    self = 0;
     created.clear();
     joined.clear();
 }
@@ -32,6 +33,7 @@ int __real_pthread_create(pthread_t* thread, const pthread_attr_t* attributes,
 int __real_pthread_join(pthread_t thread, void** result);
 int __real_pthread_cond_wait(pthread_cond_t* condition, pthread_mutex_t* mutex);
 int __real_pthread_cond_broadcast(pthread_cond_t* condition);
+pthread_t __real_pthread_self();
 int __real_rand();
 void __real_srand(unsigned seed);
 
@@ -68,6 +70,11 @@ int __wrap_pthread_cond_wait(pthread_cond_t* condition, pthread_mutex_t* mutex) 
 int __wrap_pthread_cond_broadcast(pthread_cond_t* condition) {
     return Faults().condBroadcast.Fails() ? Faults().condBroadcast.Error()
                                           : __real_pthread_cond_broadcast(condition);
+}
+
+pthread_t __wrap_pthread_self() {
+    const pthread_t pretended = Faults().self;
+    return pretended != 0 ? pretended : __real_pthread_self();
 }
 
 // Called with GlobalLock held, as the executor promises.

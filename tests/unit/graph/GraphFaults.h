@@ -4,6 +4,7 @@
 #include <gtest/gtest.h>
 #include <pthread.h>
 
+#include <atomic>
 #include <deque>
 #include <vector>
 
@@ -27,6 +28,9 @@ struct GraphFaults {
     // The threads in the order in which they were created and joined.
     std::vector<pthread_t> created;
     std::vector<pthread_t> joined;
+
+    // What pthread_self() answers; 0: the truth.
+    std::atomic<pthread_t> self{0};
 
     void Reset();
 };

@@ -6,11 +6,11 @@
 #include <memory>
 #include <string>
 
+#include "json/DocumentText.h"
+#include "json/JSONPlugin.h"
 #include "plugins/Exceptions.h"
 #include "support/ErrorText.h"
 #include "support/TempFolder.h"
-#include "json/DocumentText.h"
-#include "json/JSONPlugin.h"
 
 namespace vantor::support {
 

@@ -6,9 +6,9 @@
 
 #include "graph/Executor.h"
 #include "graph/InitBarrier.h"
+#include "json/JSONPluginFixture.h"
 #include "support/AlertRecorder.h"
 #include "support/GraphText.h"
-#include "json/JSONPluginFixture.h"
 
 namespace vantor {
 

@@ -5,9 +5,9 @@
 
 #include <stdexcept>
 
-#include "support/SyslogCapture.h"
 #include "json/BaseKitDouble.h"
 #include "json/JSONPluginFixture.h"
+#include "support/SyslogCapture.h"
 
 namespace vantor {
 

@@ -7,8 +7,8 @@
 #include <functional>
 #include <set>
 
-#include "support/SyslogCapture.h"
 #include "json/JSONPluginFixture.h"
+#include "support/SyslogCapture.h"
 
 namespace vantor {
 

@@ -9,11 +9,11 @@
 #include <stdexcept>
 #include <utility>
 
-#include "support/TempFolder.h"
 #include "json/AllocationMeter.h"
 #include "json/JsonReader.h"
 #include "json/JsonText.h"
 #include "json/TestBuffers.h"
+#include "support/TempFolder.h"
 
 namespace vantor {
 

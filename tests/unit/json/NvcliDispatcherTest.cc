@@ -13,12 +13,12 @@
 #include <stdexcept>
 #include <thread>
 
+#include "json/BaseKitDouble.h"
+#include "json/RunCommand.h"
 #include "support/ErrorText.h"
 #include "support/FreshProcess.h"
 #include "support/SyslogCapture.h"
 #include "support/Waiting.h"
-#include "json/BaseKitDouble.h"
-#include "json/RunCommand.h"
 
 namespace vantor {
 

@@ -10,11 +10,11 @@
 #include <thread>
 
 #include "graph/GlobalLock.h"
+#include "json/BaseKitDouble.h"
+#include "json/NvcliDispatcher.h"
 #include "support/ErrorText.h"
 #include "support/SyslogCapture.h"
 #include "support/Waiting.h"
-#include "json/BaseKitDouble.h"
-#include "json/NvcliDispatcher.h"
 
 namespace vantor {
 

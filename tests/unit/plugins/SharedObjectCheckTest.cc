@@ -225,6 +225,41 @@ TEST_F(CutObjectTest, AHeaderTableBeyondTheEndIsTheLinkersToReject) {
     EXPECT_EQ(VerdictOn(image.bytes), "");
 }
 
+// Cut short too, but refused by its header before anything of it is touched.
+TEST_F(CutObjectTest, AnObjectThatThisProcessCannotLoadIsTheLinkersToReject) {
+    struct Change {
+        const char* what;
+        void (*make)(ElfW(Ehdr) & header);
+    };
+    const Change changes[] = {
+        {"machine", [](ElfW(Ehdr) & header) { header.e_machine = EM_S390; }},
+        {"relocatable", [](ElfW(Ehdr) & header) { header.e_type = ET_REL; }},
+        {"executable", [](ElfW(Ehdr) & header) { header.e_type = ET_EXEC; }},
+        {"byte order", [](ElfW(Ehdr) & header) { header.e_ident[EI_DATA] = ELFDATA2MSB; }},
+        {"ident version", [](ElfW(Ehdr) & header) { header.e_ident[EI_VERSION] = 9; }},
+        {"version", [](ElfW(Ehdr) & header) { header.e_version = 9; }},
+        {"OS ABI", [](ElfW(Ehdr) & header) { header.e_ident[EI_OSABI] = ELFOSABI_HPUX; }},
+        {"ABI version", [](ElfW(Ehdr) & header) { header.e_ident[EI_ABIVERSION] = 9; }},
+        {"padding", [](ElfW(Ehdr) & header) { header.e_ident[EI_NIDENT - 1] = 1; }},
+    };
+    for (const Change& change : changes) {
+        ObjectImage changed = image;
+        ElfW(Ehdr) header = changed.Header();
+        change.make(header);
+        changed.SetHeader(header);
+        EXPECT_EQ(VerdictOn(changed.bytes.substr(0, 4096)), "") << change.what;
+        EXPECT_EQ(dlopen(path.c_str(), RTLD_LAZY), nullptr) << change.what;
+    }
+}
+
+TEST_F(CutObjectTest, ASegmentWithoutBytesOfTheFileMayStartBeyondItsEnd) {
+    ElfW(Phdr) segment = image.Segment(image.LastLoaded());
+    segment.p_filesz = 0;
+    segment.p_offset += 1U << 30U;
+    image.SetSegment(image.LastLoaded(), segment);
+    EXPECT_EQ(VerdictOn(image.bytes), "");
+}
+
 TEST_F(CutObjectTest, AnObjectOfAnotherWordSizeIsTheLinkersToReject) {
     image.bytes.resize(4096);
     image.bytes[EI_CLASS] = static_cast<char>(sizeof(void*) == 4 ? ELFCLASS64 : ELFCLASS32);
