@@ -54,9 +54,9 @@ void Append(const std::string& line) {
 
 namespace NvkCtl::System {
 
-SystemInfoImpl::SystemInfoImpl() {}  // NOLINT(*-use-equals-default): an exported symbol
+SystemInfoImpl::SystemInfoImpl() {}
 
-SystemInfoImpl::~SystemInfoImpl() {}  // NOLINT(*-use-equals-default): an exported symbol
+SystemInfoImpl::~SystemInfoImpl() {}
 
 void SystemInfoImpl::SetSystemAlert(const std::string& text) {
     const int savedErrno = errno;
