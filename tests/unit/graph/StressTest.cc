@@ -36,7 +36,7 @@ struct Batch {
 const Batch batches[] = {
     {"Small", 10000, 12, 2000, 1000},
     {"Middle", 20000, 150, 300, 150},
-    {"Large", 30000, 3000, 20, 8},
+    {"Large", 30000, 3000, 20, 6},
 };
 
 class StressTest : public ::testing::TestWithParam<Batch> {

@@ -5,6 +5,7 @@
 #include <unistd.h>
 
 #include <cerrno>
+#include <cstdio>
 #include <exception>
 #include <stdexcept>
 
@@ -54,6 +55,8 @@ ChildReport RunForked(const std::function<int(int report)>& body) {
     if (pipe(ends) != 0) {
         throw std::runtime_error("no pipe for a child");
     }
+    // What is still in the buffers would be written by both.
+    (void)std::fflush(nullptr);
     const pid_t child = fork();
     if (child == 0) {
         close(ends[0]);
