@@ -13,10 +13,20 @@ function(vantor_unit_test name)
     foreach(function IN LISTS arg_WRAP)
         target_link_options(${name} PRIVATE -Wl,--wrap=${function})
     endforeach()
-    # Most of a build's time would go into the tests: what they include is compiled once a program,
-    # and they themselves are not optimised. What they test is.
-    target_precompile_headers(${name} PRIVATE <gmock/gmock.h> <gtest/gtest.h>)
-    target_compile_options(${name} PRIVATE -O0 -g1 -U_FORTIFY_SOURCE)
+    # Most of a build's time would go into the tests: what they include is compiled once, by the
+    # first program, and they themselves are neither optimised nor searched for undefined behaviour.
+    # What they test is.
+    get_property(headersOwner GLOBAL PROPERTY VANTOR_TEST_HEADERS_OWNER)
+    if(headersOwner)
+        target_precompile_headers(${name} REUSE_FROM ${headersOwner})
+    else()
+        target_precompile_headers(${name} PRIVATE
+            <gmock/gmock.h> <gtest/gtest.h> <boost/filesystem.hpp>
+            <algorithm> <atomic> <deque> <fstream> <functional> <list> <map> <sstream> <thread>)
+        set_property(GLOBAL PROPERTY VANTOR_TEST_HEADERS_OWNER ${name})
+    endif()
+    target_compile_options(${name} PRIVATE -O0 -g1 -U_FORTIFY_SOURCE
+        -fno-sanitize=undefined)
     set_target_properties(${name} PROPERTIES
         RUNTIME_OUTPUT_DIRECTORY ${PROJECT_BINARY_DIR}/bin/tests
         BUILD_RPATH "$ORIGIN/../../lib")
