@@ -7,7 +7,8 @@ import pytest
 from harness.messages import BOOT_FAILED, INVOKE_FAILED, NOT_ELF, linker_says, starting
 from harness.syslog_recorder import ERR, INFO, WARNING
 
-MORE_THAN_FITS = 1 << 48  # a stack that no thread can have
+# A stack for which no address space has room, by the bytes of a pointer.
+MORE_THAN_FITS = {4: 0xF0000000, 8: 1 << 48}
 NO_THREAD = "Could not create enough execution threads. (0 created, {}requested)"
 
 
@@ -56,7 +57,7 @@ def no_threads(session):
     """Limits under which no thread can be made."""
     if "tsan" in session.sanitizers.names:
         pytest.skip("the thread sanitizer does not start with such a stack limit")
-    return {"stack_size": MORE_THAN_FITS}
+    return {"stack_size": MORE_THAN_FITS[session.base.word_size]}
 
 
 def test_threads_that_cannot_be_made_end_the_run(root, vantor, no_threads):

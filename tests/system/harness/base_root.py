@@ -46,6 +46,8 @@ class BaseRoot:
         self._lay_out()
         with open(self.program, "rb") as file:
             content = file.read()
+        # The class byte of an ELF file, elf(5): 1 for 32 bits, 2 for 64.
+        self.word_size = {1: 4, 2: 8}[content[4]]
         self.sanitizers = [
             name for name in ("asan", "tsan", "ubsan")
             if f"__{name}_".encode() in content

@@ -9,8 +9,7 @@ function(vantor_test_double name)
     add_library(${name} OBJECT ${arg_SOURCES})
     target_include_directories(${name} PUBLIC ${PROJECT_SOURCE_DIR}/tests/unit)
     target_link_libraries(${name} PUBLIC ${arg_DEPENDS})
-    list(TRANSFORM arg_WRAP PREPEND -Wl,--wrap=)
-    target_link_options(${name} INTERFACE ${arg_WRAP})
+    vantor_wrap(${name} INTERFACE ${arg_WRAP})
 endfunction()
 
 vantor_test_double(test_syslog

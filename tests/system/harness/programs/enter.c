@@ -12,6 +12,7 @@
  * 125 is the status of every failure before the program runs.
  */
 #define _GNU_SOURCE
+#define _FILE_OFFSET_BITS 64 /* limits have 64 bits on every machine */
 
 #include <errno.h>
 #include <fcntl.h>
@@ -30,7 +31,7 @@ static void Fail(const char* what) {
 }
 
 static void LimitFileSize(const char* bytes) {
-    const rlim_t size = strtoul(bytes, NULL, 10);
+    const rlim_t size = strtoull(bytes, NULL, 10);
     const struct rlimit limit = {size, size};
     signal(SIGXFSZ, SIG_IGN);
     if (setrlimit(RLIMIT_FSIZE, &limit) != 0) {
@@ -44,13 +45,13 @@ static void LimitOpenFiles(const char* count) {
     if (getrlimit(RLIMIT_NOFILE, &now) != 0) {
         Fail("open files");
     }
-    for (rlim_t wish = strtoul(count, NULL, 10); wish > now.rlim_max; wish /= 2) {
+    for (rlim_t wish = strtoull(count, NULL, 10); wish > now.rlim_max; wish /= 2) {
         const struct rlimit limit = {wish, wish};
         if (setrlimit(RLIMIT_NOFILE, &limit) == 0) {
             return;
         }
     }
-    const rlim_t wish = strtoul(count, NULL, 10);
+    const rlim_t wish = strtoull(count, NULL, 10);
     now.rlim_cur = wish < now.rlim_max ? wish : now.rlim_max;
     if (setrlimit(RLIMIT_NOFILE, &now) != 0) {
         Fail("open files");
@@ -62,7 +63,7 @@ static void LimitStackSize(const char* bytes) {
     if (getrlimit(RLIMIT_STACK, &limit) != 0) {
         Fail("stack size");
     }
-    limit.rlim_cur = strtoul(bytes, NULL, 10);
+    limit.rlim_cur = strtoull(bytes, NULL, 10);
     if (setrlimit(RLIMIT_STACK, &limit) != 0) {
         Fail("stack size");
     }
