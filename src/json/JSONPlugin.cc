@@ -1,6 +1,7 @@
 #include "json/JSONPlugin.h"
 
-#include <boost/filesystem/operations.hpp>
+#include <sys/stat.h>
+
 #include <fstream>
 #include <utility>
 
@@ -17,11 +18,12 @@ constexpr std::int32_t newestVersion = 4;
 constexpr std::int32_t hostProfileVersion = 2;  // first version with "apply_host_profile"
 constexpr std::int32_t flagsVersion = 3;        // first version with flags and run-once
 
-// Opening anything but a regular file could block for ever.
+// Opening anything but a regular file could block for ever. Asked of the system rather than of
+// Boost, whose answer on a 32-bit host is an error for a file of the time after 2038.
 JsonValue ReadDocument(const std::string& path) {
-    boost::system::error_code error;
+    struct stat status {};
     std::ifstream stream;
-    if (boost::filesystem::is_regular_file(path, error)) {
+    if (stat(path.c_str(), &status) == 0 && S_ISREG(status.st_mode)) {
         stream.open(path, std::ios_base::in | std::ios_base::binary);
     }
     if (!stream.is_open()) {

@@ -1,6 +1,6 @@
 #include "plugins/HostProfile.h"
 
-#include <boost/filesystem/operations.hpp>
+#include <sys/stat.h>
 
 #include "graph/GlobalLock.h"
 
@@ -11,10 +11,11 @@ namespace {
 constexpr const char* hostProfileFile = "/etc/nuvex/hostprofile.xml";
 constexpr const char* compressedHostProfileFile = "/etc/nuvex/hostprofile.xml.gz";
 
+// Boost's own status() has times of 32 bits on a 32-bit host: it takes a file of the time after
+// 2038 for one that cannot be read.
 bool Exists(const char* path) {
-    boost::system::error_code error;
-    const boost::filesystem::file_type type = boost::filesystem::status(path, error).type();
-    return type != boost::filesystem::status_error && type != boost::filesystem::file_not_found;
+    struct stat status {};
+    return stat(path, &status) == 0;
 }
 
 }  // namespace

@@ -38,3 +38,7 @@ def test_calls_of_the_c_library_are_checked(readelf, session):
     if session.base.sanitizers:
         pytest.skip("the sanitizers check these calls themselves")
     assert re.search(r"__(?!stack)\w+_chk@", readelf("--dyn-syms"))
+
+
+def test_no_code_is_changed_when_it_is_loaded(readelf):
+    assert "TEXTREL" not in readelf("-d")
