@@ -1,7 +1,6 @@
 #include "graph/Executor.h"
 
 #include <cstdlib>
-#include <iterator>
 #include <memory>
 #include <string>
 
@@ -71,37 +70,15 @@ void Executor::StopWorkers() {
 
 void Executor::Enqueue(Node& node) {
     const GlobalLockGuard guard;
-    queue.push_back(&node);
+    queue.Push(node);
     GlobalLock::Broadcast(workAvailable);
 }
 
 std::size_t Executor::PickNext() const {
-    std::int32_t best = 0;
-    std::vector<std::size_t> candidates;
-    std::size_t position = 0;
-    for (Node* node : queue) {
-        const std::int32_t height = node->Height();
-        if (height > best) {
-            candidates.clear();
-            best = height;
-        }
-        if (height == best) {
-            candidates.push_back(position);
-        }
-        ++position;
-    }
     if (!randomize) {
-        return candidates.front();
+        return 0;
     }
-    const auto draw = static_cast<std::size_t>(std::rand());
-    return candidates[draw % candidates.size()];
-}
-
-Node& Executor::TakeNext() {
-    const auto chosen = std::next(queue.begin(), static_cast<std::ptrdiff_t>(PickNext()));
-    Node& node = **chosen;
-    queue.erase(chosen);
-    return node;
+    return static_cast<std::size_t>(std::rand()) % queue.HighestCount();
 }
 
 void* Executor::WorkerEntry(void* argument) {
@@ -115,8 +92,8 @@ void* Executor::WorkerEntry(void* argument) {
 void Executor::RunWorker() {
     GlobalLockGuard guard;
     while (!stopping) {
-        while (!queue.empty()) {
-            Node& node = TakeNext();
+        while (!queue.Empty()) {
+            Node& node = queue.TakeHighest(PickNext());
             guard.Release();
             node.Execute(*this);
             guard.Retake();

@@ -5,8 +5,9 @@
 
 #include <cstddef>
 #include <cstdint>
-#include <list>
 #include <vector>
+
+#include "graph/ReadyQueue.h"
 
 namespace vantor {
 
@@ -33,13 +34,13 @@ public:
     // never run.
     virtual ~Executor();
 
-    // Puts a node that has become ready at the end of the queue and wakes the workers. Takes
+    // Puts a node that has become ready into the queue and wakes the workers. Takes
     // GlobalLock. Only for Node::Schedule(), which has set the node's state; the node must outlive
     // the executor.
     void Enqueue(Node& node);
 
-    // The position in the queue, counted from 0, of the node to run next. The caller holds
-    // GlobalLock, and the queue is not empty.
+    // Which node to run next: its position among the highest of the queue, counted from 0 in the
+    // order in which they became ready. The caller holds GlobalLock, and the queue is not empty.
     std::size_t PickNext() const;
 
 private:
@@ -47,10 +48,9 @@ private:
     void RunWorker();
     void StartWorkers(std::int32_t threadCount);
     void StopWorkers();
-    Node& TakeNext();
 
     pthread_cond_t workAvailable;  // broadcast when a node is queued and when the pool stops
-    std::list<Node*> queue;        // ready nodes, longest ready first
+    ReadyQueue queue;
     std::vector<pthread_t> threads;
     bool stopping = false;
     bool randomize;

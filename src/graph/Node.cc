@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <utility>
+#include <vector>
 
 #include "graph/Executor.h"
 #include "graph/GlobalLock.h"
@@ -45,21 +46,57 @@ void Node::AddDependent(Node& other) {
 
 void Node::Schedule(Executor& executor) {
     const GlobalLockGuard guard;
-    if (state == NodeState::Queued || state == NodeState::Done) {
-        return;
+    if (state == NodeState::Idle) {
+        Request(executor);
+    } else if (state == NodeState::Waiting) {
+        QueueIfReady(executor);
     }
-    state = NodeState::Waiting;
-    bool ready = true;
-    for (Node* dependency : dependencies) {
-        if (dependency->state == NodeState::Done) {
+}
+
+// Depth first, in the order of the lists: a dependency that nobody has requested yet is requested,
+// with all that it waits for, before the next one is looked at.
+void Node::Request(Executor& executor) {
+    std::vector<Node*> requesters;
+    Node* node = this;
+    node->BecomeWaiting();
+    for (;;) {
+        if (Node* const idle = node->NextIdleDependency()) {
+            requesters.push_back(node);
+            node = idle;
+            node->BecomeWaiting();
             continue;
         }
-        if (dependency->state == NodeState::Idle) {
-            dependency->Schedule(executor);
+        node->firstUndone = node->dependencies.cbegin();
+        node->QueueIfReady(executor);
+        if (requesters.empty()) {
+            return;
         }
-        ready = false;
+        node = requesters.back();
+        requesters.pop_back();
     }
-    if (ready) {
+}
+
+void Node::BecomeWaiting() {
+    state = NodeState::Waiting;
+    firstUndone = dependencies.cbegin();
+}
+
+Node* Node::NextIdleDependency() {
+    while (firstUndone != dependencies.cend()) {
+        Node* const dependency = *firstUndone++;
+        if (dependency->state == NodeState::Idle) {
+            return dependency;
+        }
+    }
+    return nullptr;
+}
+
+// A dependency that is done stays so: none is looked at again.
+void Node::QueueIfReady(Executor& executor) {
+    while (firstUndone != dependencies.cend() && (*firstUndone)->state == NodeState::Done) {
+        ++firstUndone;
+    }
+    if (firstUndone == dependencies.cend()) {
         state = NodeState::Queued;
         executor.Enqueue(*this);
     }
@@ -92,14 +129,44 @@ void Node::MarkDone() {
 std::int32_t Node::Height() {
     const GlobalLockGuard guard;
     if (!heightKnown) {
-        std::int32_t highest = 0;
-        for (Node* dependent : dependents) {
-            highest = std::max(highest, dependent->Height());
-        }
-        height = highest + 1;
-        heightKnown = true;
+        ComputeHeight();
     }
     return height;
+}
+
+// Depth first. While a node is under way its height is that of the highest dependent seen so far,
+// and 0 before there is one; a dependent that is under way itself closes a cycle.
+void Node::ComputeHeight() {
+    struct Visit {
+        Node* node;
+        Edges::const_iterator next;  // the dependent to look at
+    };
+    std::vector<Visit> path;
+    height = 0;
+    Visit visit{this, dependents.cbegin()};
+    for (;;) {
+        const Edges& edges = visit.node->dependents;
+        while (visit.next != edges.cend() && (*visit.next)->height >= 0) {
+            if ((*visit.next)->heightKnown) {
+                visit.node->height = std::max(visit.node->height, (*visit.next)->height);
+            }
+            ++visit.next;
+        }
+        if (visit.next != edges.cend()) {
+            path.push_back(visit);
+            Node* const unknown = *visit.next;
+            unknown->height = 0;
+            visit = {unknown, unknown->dependents.cbegin()};
+            continue;
+        }
+        ++visit.node->height;
+        visit.node->heightKnown = true;
+        if (path.empty()) {
+            return;
+        }
+        visit = path.back();
+        path.pop_back();
+    }
 }
 
 }  // namespace vantor

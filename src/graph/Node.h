@@ -29,8 +29,8 @@ enum class NodeState : std::int32_t {
 // There is no way back and no state for failure: what became of a plugin's method is the plugin's
 // own record. All state and both lists are guarded by GlobalLock, which every operation takes
 // itself unless it says otherwise; calling them with the lock held is allowed. Edges are added only
-// before any worker exists. Nothing looks for cycles: a node on one is never run, and computing the
-// height of a node from which one is reached ends with the stack.
+// before any worker exists. Nothing looks for cycles: a node on one is never run. No operation
+// recurses, so that a chain may be as long as memory allows.
 class Node {
 public:
     // Throws Exception when the condition variable cannot be initialised.
@@ -82,16 +82,30 @@ public:
 
     // Number of nodes on the longest chain that starts here and follows dependents: 1 for a node
     // that none waits for. Computed once and kept, so no edge may be added below this node after
-    // the first call.
+    // the first call. Where the chains lead into a cycle, the edges that close it are left out.
     std::int32_t Height();
 
 private:
+    friend class ReadyQueue;  // chains the nodes that are ready through `nextReady`
+
+    using Edges = std::list<Node*>;
+
+    void Request(Executor& executor);
+    void BecomeWaiting();
+    Node* NextIdleDependency();
+    void QueueIfReady(Executor& executor);
+    void ComputeHeight();
+
     bool heightKnown = false;
     std::int32_t height = -1;
     NodeState state = NodeState::Idle;
     std::string name;
     std::list<Node*> dependencies;
     std::list<Node*> dependents;
+    // Of a waiting node: the dependencies before it are done. While the node is being requested:
+    // those before it have been requested.
+    Edges::const_iterator firstUndone;
+    Node* nextReady = nullptr;
     pthread_cond_t doneCondition;  // broadcast when the node becomes done through Execute()
 };
 

@@ -66,11 +66,11 @@ TEST_F(ExecutorTest, PickNextReturnsTheFirstOfTheHighest) {
     GraphText graph({"low", "a provides x", "lower", "b provides x", "c requires x"});
     Executor executor(0, false);
     graph.Schedule(executor);
-    EXPECT_EQ(PickNext(executor), 1U);
+    EXPECT_EQ(PickNext(executor), 0U);
     EXPECT_EQ(Faults().rand.Calls(), 0);
 }
 
-// The highest are at the positions 1, 3 and 4.
+// a, b and c, the highest, are the choice.
 TEST_F(ExecutorTest, RandomPickIsTheDrawModuloTheNumberOfTheHighest) {
     GraphText graph(
         {"low", "a provides x", "lower", "b provides x", "c provides x", "d requires x"});
@@ -81,7 +81,7 @@ TEST_F(ExecutorTest, RandomPickIsTheDrawModuloTheNumberOfTheHighest) {
     while (!Faults().draws.empty()) {
         picks.push_back(PickNext(executor));
     }
-    EXPECT_THAT(picks, ElementsAre(1, 3, 4, 1, 3, 4, 3));
+    EXPECT_THAT(picks, ElementsAre(0, 1, 2, 0, 1, 2, 1));
 }
 
 TEST_F(ExecutorTest, RandomPickDrawsOnceAlsoWhenThereIsNoChoice) {
@@ -89,7 +89,7 @@ TEST_F(ExecutorTest, RandomPickDrawsOnceAlsoWhenThereIsNoChoice) {
     Executor executor(0, true);
     graph.Schedule(executor);
     Faults().draws = {5, 6};
-    EXPECT_EQ(PickNext(executor), 1U);
+    EXPECT_EQ(PickNext(executor), 0U);
     EXPECT_THAT(Faults().draws, ElementsAre(6));
 }
 

@@ -1,0 +1,189 @@
+#include "graph/ReadyQueue.h"
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <list>
+#include <memory>
+#include <random>
+#include <string>
+#include <vector>
+
+#include "graph/GlobalLock.h"
+#include "graph/GraphFaults.h"
+#include "support/GraphText.h"
+
+namespace vantor {
+
+namespace {
+
+using support::RunOrder;
+using support::TestNode;
+using ::testing::ElementsAre;
+
+// Nodes of chosen heights: each has one of a chain below it, whose heights are 1, 2, 3 and so on.
+class NodesOfHeights {
+public:
+    explicit NodesOfHeights(int greatest) {
+        for (int height = 1; height < greatest; ++height) {
+            TestNode& node = Make("chain" + std::to_string(height));
+            if (height > 1) {
+                node.AddDependent(*chain.back());
+            }
+            chain.push_back(&node);
+        }
+    }
+
+    TestNode& OfHeight(int height) {
+        TestNode& node = Make(std::to_string(height) + "#" + std::to_string(nodes.size()));
+        if (height > 1) {
+            node.AddDependent(*chain[static_cast<std::size_t>(height) - 2]);
+        }
+        return node;
+    }
+
+private:
+    TestNode& Make(const std::string& name) {
+        nodes.push_back(std::make_unique<TestNode>(name, order));
+        return *nodes.back();
+    }
+
+    RunOrder order;
+    std::vector<std::unique_ptr<TestNode>> nodes;
+    std::vector<TestNode*> chain;
+};
+
+// One list in the order in which the nodes became ready, and one pass over it for each choice.
+class PlainScan {
+public:
+    using Position = std::list<Node*>::iterator;
+
+    void Push(Node& node) { queue.push_back(&node); }
+    bool Empty() const { return queue.empty(); }
+    void Take(Position position) { queue.erase(position); }
+
+    const std::vector<Position>& Highest() {
+        std::int32_t best = 0;
+        for (auto node = queue.begin(); node != queue.end(); ++node) {
+            const std::int32_t height = (*node)->Height();
+            if (height > best) {
+                candidates.clear();
+                best = height;
+            }
+            if (height == best) {
+                candidates.push_back(node);
+            }
+        }
+        return candidates;
+    }
+
+private:
+    std::list<Node*> queue;
+    std::vector<Position> candidates;
+};
+
+class ReadyQueueTest : public support::GraphTest {
+protected:
+    void Push(std::initializer_list<Node*> pushed) {
+        for (Node* node : pushed) {
+            queue.Push(*node);
+        }
+    }
+
+    NodesOfHeights nodes{9};
+    ReadyQueue queue;
+    const GlobalLockGuard guard;
+};
+
+TEST_F(ReadyQueueTest, IsEmptyUntilANodeIsPushedAndAfterTheLastIsTaken) {
+    TestNode& node = nodes.OfHeight(1);
+    EXPECT_TRUE(queue.Empty());
+    queue.Push(node);
+    EXPECT_FALSE(queue.Empty());
+    EXPECT_EQ(&queue.TakeHighest(0), &node);
+    EXPECT_TRUE(queue.Empty());
+}
+
+TEST_F(ReadyQueueTest, EqualsLeaveInTheOrderInWhichTheyCame) {
+    TestNode& first = nodes.OfHeight(3);
+    TestNode& second = nodes.OfHeight(3);
+    TestNode& third = nodes.OfHeight(3);
+    Push({&first, &second, &third});
+    EXPECT_EQ(&queue.TakeHighest(0), &first);
+    EXPECT_EQ(&queue.TakeHighest(0), &second);
+    EXPECT_EQ(&queue.TakeHighest(0), &third);
+}
+
+TEST_F(ReadyQueueTest, AHigherNodeThatCameLaterLeavesFirst) {
+    TestNode& low = nodes.OfHeight(1);
+    TestNode& high = nodes.OfHeight(9);
+    TestNode& middle = nodes.OfHeight(4);
+    Push({&low, &high, &middle});
+    EXPECT_EQ(&queue.TakeHighest(0), &high);
+    EXPECT_EQ(&queue.TakeHighest(0), &middle);
+    EXPECT_EQ(&queue.TakeHighest(0), &low);
+}
+
+TEST_F(ReadyQueueTest, OnlyTheHighestAreCounted) {
+    Push({&nodes.OfHeight(2), &nodes.OfHeight(5), &nodes.OfHeight(2), &nodes.OfHeight(5)});
+    EXPECT_EQ(queue.HighestCount(), 2U);
+}
+
+TEST_F(ReadyQueueTest, OneFromTheMiddleLeavesTheOthersInTheirOrder) {
+    TestNode& first = nodes.OfHeight(2);
+    TestNode& second = nodes.OfHeight(2);
+    TestNode& third = nodes.OfHeight(2);
+    Push({&first, &second, &third});
+    EXPECT_EQ(&queue.TakeHighest(1), &second);
+    EXPECT_EQ(&queue.TakeHighest(0), &first);
+    EXPECT_EQ(&queue.TakeHighest(0), &third);
+}
+
+TEST_F(ReadyQueueTest, WhoComesAfterTheLastWasTakenStandsAtTheEnd) {
+    TestNode& first = nodes.OfHeight(2);
+    TestNode& last = nodes.OfHeight(2);
+    TestNode& later = nodes.OfHeight(2);
+    Push({&first, &last});
+    EXPECT_EQ(&queue.TakeHighest(1), &last);
+    queue.Push(later);
+    EXPECT_EQ(&queue.TakeHighest(0), &first);
+    EXPECT_EQ(&queue.TakeHighest(0), &later);
+}
+
+// The choice of a plain scan, and of a draw among the highest, at every one of a million steps.
+TEST_F(ReadyQueueTest, AMillionRandomStepsChooseAsAPlainScanDoes) {
+    const int greatestHeight = 5;
+    const std::size_t nodeCount = 24;
+    std::mt19937 random(20261122);
+    std::vector<Node*> idle;
+    for (std::size_t index = 0; index < nodeCount; ++index) {
+        idle.push_back(&nodes.OfHeight(1 + static_cast<int>(random() % greatestHeight)));
+    }
+    PlainScan model;
+    std::size_t choices = 0;
+    for (int step = 0; step < 1000000; ++step) {
+        const bool push = model.Empty() || (!idle.empty() && random() % 2 == 0);
+        if (push) {
+            std::swap(idle[random() % idle.size()], idle.back());
+            queue.Push(*idle.back());
+            model.Push(*idle.back());
+            idle.pop_back();
+            continue;
+        }
+        const std::vector<PlainScan::Position>& highest = model.Highest();
+        ASSERT_EQ(queue.HighestCount(), highest.size()) << "step " << step;
+        const std::size_t position = random() % 2 == 0 ? 0 : random() % highest.size();
+        Node& taken = queue.TakeHighest(position);
+        ASSERT_EQ(&taken, *highest[position]) << "step " << step;
+        model.Take(highest[position]);
+        ASSERT_EQ(queue.Empty(), model.Empty()) << "step " << step;
+        idle.push_back(&taken);
+        ++choices;
+    }
+    EXPECT_GT(choices, 400000U);
+}
+
+}  // namespace
+
+}  // namespace vantor
