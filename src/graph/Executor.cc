@@ -69,7 +69,6 @@ void Executor::StopWorkers() {
 }
 
 void Executor::Enqueue(Node& node) {
-    const GlobalLockGuard guard;
     queue.Push(node);
     GlobalLock::Broadcast(workAvailable);
 }

@@ -34,9 +34,8 @@ public:
     // never run.
     virtual ~Executor();
 
-    // Puts a node that has become ready into the queue and wakes the workers. Takes
-    // GlobalLock. Only for Node::Schedule(), which has set the node's state; the node must outlive
-    // the executor.
+    // Puts a node that has become ready into the queue and wakes the workers. Only for Node, which
+    // holds GlobalLock and has set the node's state; the node must outlive the executor.
     void Enqueue(Node& node);
 
     // Which node to run next: its position among the highest of the queue, counted from 0 in the

@@ -108,7 +108,7 @@ void Node::Execute(Executor& executor) {
     state = NodeState::Done;
     for (Node* dependent : dependents) {
         if (dependent->state == NodeState::Waiting) {
-            dependent->Schedule(executor);
+            dependent->QueueIfReady(executor);
         }
     }
     GlobalLock::Broadcast(doneCondition);
@@ -128,6 +128,10 @@ void Node::MarkDone() {
 
 std::int32_t Node::Height() {
     const GlobalLockGuard guard;
+    return HeightLocked();
+}
+
+std::int32_t Node::HeightLocked() {
     if (!heightKnown) {
         ComputeHeight();
     }

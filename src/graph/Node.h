@@ -90,6 +90,8 @@ private:
 
     using Edges = std::list<Node*>;
 
+    // The caller of any of these holds the lock.
+    std::int32_t HeightLocked();
     void Request(Executor& executor);
     void BecomeWaiting();
     Node* NextIdleDependency();

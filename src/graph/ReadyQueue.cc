@@ -7,7 +7,7 @@
 namespace vantor {
 
 void ReadyQueue::Push(Node& node) {
-    const std::int32_t height = node.Height();
+    const std::int32_t height = node.HeightLocked();
     auto found = rows.lower_bound(height);
     if (found == rows.end() || found->first != height) {
         if (spare.empty()) {
