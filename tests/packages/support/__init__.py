@@ -1,0 +1,1 @@
+"""What the package tests are written with: packages, and hosts to install them on."""
