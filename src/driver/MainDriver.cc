@@ -18,6 +18,7 @@
 #include "driver/RunOnceRecord.h"
 #include "graph/DotWriter.h"
 #include "graph/Executor.h"
+#include "graph/GlobalLock.h"
 #include "graph/InitBarrier.h"
 #include "graph/KeepUntilExit.h"
 #include "plugins/DebugPlugin.h"
@@ -133,12 +134,14 @@ bool MainDriver::DumpGraph() const {
 
 void MainDriver::RunGraph() {
     Executor executor(config.threads, config.randomize);
-    for (Plugin* node : nodes) {
-        node->Schedule(executor);
+    {
+        // No worker chooses before it can choose among all that is ready.
+        const GlobalLockGuard guard;
+        for (Plugin* node : nodes) {
+            node->Schedule(executor);
+        }
     }
-    for (Plugin* node : nodes) {
-        node->WaitDone();
-    }
+    Node::WaitAllDone(nodes);
     WriteRunOnceRecord(options.runOncePlugins);
 }
 

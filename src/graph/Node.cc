@@ -116,6 +116,10 @@ void Node::Execute(Executor& executor) {
 
 void Node::WaitDone() {
     const GlobalLockGuard guard;
+    WaitDoneLocked();
+}
+
+void Node::WaitDoneLocked() {
     while (state != NodeState::Done) {
         GlobalLock::Wait(doneCondition);
     }

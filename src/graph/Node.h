@@ -7,6 +7,8 @@
 #include <list>
 #include <string>
 
+#include "graph/GlobalLock.h"
+
 namespace vantor {
 
 class Executor;
@@ -76,6 +78,17 @@ public:
     // Blocks until the node is done.
     void WaitDone();
 
+    // As WaitDone() for each of a sequence of pointers to nodes, in its order, but with the lock
+    // taken once: whoever waits for very many short nodes keeps it from the workers no more than
+    // needed.
+    template <typename Nodes>
+    static void WaitAllDone(const Nodes& nodes) {
+        const GlobalLockGuard guard;
+        for (Node* node : nodes) {
+            node->WaitDoneLocked();
+        }
+    }
+
     // Declares the node finished without running it. Wakes nobody and looks at no dependent: for
     // use before execution starts.
     void MarkDone();
@@ -91,6 +104,7 @@ private:
     using Edges = std::list<Node*>;
 
     // The caller of any of these holds the lock.
+    void WaitDoneLocked();
     std::int32_t HeightLocked();
     void Request(Executor& executor);
     void BecomeWaiting();

@@ -6,7 +6,9 @@
 #include <cerrno>
 #include <memory>
 #include <thread>
+#include <vector>
 
+#include "graph/Executor.h"
 #include "graph/GlobalLock.h"
 #include "graph/GraphFaults.h"
 #include "plugins/Exceptions.h"
@@ -181,6 +183,22 @@ TEST_F(NodeTest, OperationsMayBeCalledWithTheLockHeld) {
     EXPECT_EQ(other->State(), NodeState::Done);
     EXPECT_EQ(other->Height(), 2);
     EXPECT_TRUE(GlobalLock::HeldByCurrentThread());
+}
+
+TEST_F(NodeTest, WaitAllDoneReturnsWhenEveryNodeIsDone) {
+    GraphText graph({"a provides x", "b requires x", "c"});
+    const std::vector<Node*> nodes = {&graph["a"], &graph["b"], &graph["c"]};
+    Executor executor(2, false);
+    graph.Schedule(executor);
+    Node::WaitAllDone(nodes);
+    for (const Node* node : nodes) {
+        EXPECT_EQ(node->State(), NodeState::Done) << node->Name();
+    }
+}
+
+TEST_F(NodeTest, WaitAllDoneDoesNotWaitForNothing) {
+    Node::WaitAllDone(std::vector<Node*>());
+    EXPECT_EQ(Faults().condWait.Calls(), 0);
 }
 
 }  // namespace
