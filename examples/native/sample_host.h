@@ -33,8 +33,8 @@ static inline uint32_t host_leave(const char* name, const char* text) {
 }
 
 /* Hardware takes its time; so does the sample's. */
-static inline void host_busy(unsigned milliseconds) {
-    const struct timespec time = {milliseconds / 1000, milliseconds % 1000 * 1000000L};
+static inline void host_busy(long milliseconds) {
+    const struct timespec time = {milliseconds / 1000, milliseconds % 1000 * 1000000};
     nanosleep(&time, NULL);
 }
 
