@@ -2,8 +2,10 @@
 
 #include <atomic>
 #include <cstring>
-#include <streambuf>
+#include <iterator>
 #include <utility>
+
+#include "json/InputBytes.h"
 
 namespace vantor {
 
@@ -14,39 +16,21 @@ constexpr int deepest = 1000;
 
 std::atomic<bool> readerOption{false};
 
-bool IsBlank(int byte) { return byte == ' ' || (byte >= '\t' && byte <= '\r'); }
-
-// Reads from the stream's buffer, past the stream's own functions, which check and change the
-// stream's state for every byte; the state is set here as they would set it.
+// Reads one value and all that it is made of.
 class Reader {
 public:
-    explicit Reader(std::istream& source) : stream(source), buffer(*source.rdbuf()) {}
+    explicit Reader(std::istream& stream) : input(stream) {}
 
     void Value(JsonValue& value);
     void Object(std::map<std::string, JsonValue>& members);
     void Array(std::vector<JsonValue>& elements);
     void String(std::string& text);
-    void Number(double& number) { stream >> number; }
+    void Number(double& number) { input.Number(number); }
     void Bool(bool& flag);
     void Null();
     void Blanks();
 
 private:
-    static constexpr int end = std::char_traits<char>::eof();
-
-    bool Good() const { return !stream.fail(); }  // neither bad nor failed
-    void Fail() { stream.setstate(std::ios_base::failbit); }
-
-    // The next byte, left in the stream; `end` at the end of the input.
-    int Peek();
-    // The next byte, consumed. At the end of the input the stream fails.
-    int Take();
-    void PutBack();
-    // Consumes the byte, or fails if the next one is another.
-    void Expect(char byte);
-    // Consumes the byte if it is the next one.
-    bool Accept(char byte);
-
     void BlockComment();
     void LineComment();
     void Escape(std::string& text);
@@ -55,84 +39,47 @@ private:
     template <typename Item>
     void List(char open, char close, Item item);
 
-    std::istream& stream;
-    std::streambuf& buffer;
+    InputBytes input;
     int depth = 0;  // objects and arrays that are being read, one within the other
+    // The elements so far of the arrays that are being read, those of the innermost last. An array
+    // that others stand before gets what it needs; growing by itself it would get up to twice that.
+    std::vector<JsonValue> pending;
 };
 
-int Reader::Peek() {
-    const int byte = buffer.sgetc();
-    if (byte == end) {
-        stream.setstate(std::ios_base::eofbit);
-    }
-    return byte;
-}
-
-int Reader::Take() {
-    const int byte = buffer.sbumpc();
-    if (byte == end) {
-        stream.setstate(std::ios_base::eofbit | std::ios_base::failbit);
-    }
-    return byte;
-}
-
-void Reader::PutBack() {
-    if (buffer.sungetc() == end) {
-        stream.setstate(std::ios_base::badbit);
-    }
-}
-
-void Reader::Expect(char byte) {
-    const int taken = Take();
-    if (taken != end && taken != std::char_traits<char>::to_int_type(byte)) {
-        Fail();
-    }
-}
-
-bool Reader::Accept(char byte) {
-    if (Peek() != std::char_traits<char>::to_int_type(byte)) {
-        return false;
-    }
-    Take();
-    return true;
-}
-
 void Reader::Blanks() {
-    while (Good()) {
-        while (IsBlank(Peek())) {
-            Take();
-        }
-        if (!Accept('/')) {
+    while (input.Good()) {
+        input.SkipWhiteSpace();
+        if (!input.Accept('/')) {
             return;
         }
-        if (Peek() == '*') {
+        if (input.Peek() == '*') {
             BlockComment();
-        } else if (Accept('/')) {
+        } else if (input.Accept('/')) {
             LineComment();
         } else {
-            PutBack();
+            input.PutBack();
         }
     }
 }
 
 // Stands before the star behind the opening slash, which may end the comment too.
 void Reader::BlockComment() {
-    while (Good()) {
-        if (Take() == '*' && Accept('/')) {
+    while (input.Good()) {
+        if (input.Take() == '*' && input.Accept('/')) {
             return;
         }
     }
 }
 
 void Reader::LineComment() {
-    while (Good() && Take() != '\n') {
+    while (input.Good() && input.Take() != '\n') {
     }
 }
 
 void Reader::Value(JsonValue& value) {
     Blanks();
     JsonKind kind = JsonKind::None;
-    const int first = Good() ? Peek() : end;
+    const int first = input.Good() ? input.Peek() : InputBytes::end;
     if (first == '"') {
         String(value.text);
         kind = JsonKind::String;
@@ -151,20 +98,23 @@ void Reader::Value(JsonValue& value) {
     } else if (first == 'n') {
         Null();
         kind = JsonKind::Null;
-    } else if (Good()) {
-        Take();
+    } else if (input.Good()) {
+        input.Take();
     }
-    if (kind != JsonKind::None && Good()) {
+    if (kind != JsonKind::None && input.Good()) {
         value.kind = kind;
     }
 }
 
 void Reader::String(std::string& text) {
-    Expect('"');
-    std::string collected;
-    while (Good()) {
-        const int byte = Take();
-        if (byte == end) {
+    input.Expect('"');
+    if (!input.Good()) {
+        return;
+    }
+    std::string collected(input.TakePlainText());
+    while (input.Good()) {
+        const int byte = input.Take();
+        if (byte == InputBytes::end) {
             return;
         }
         if (byte == '"') {
@@ -176,14 +126,15 @@ void Reader::String(std::string& text) {
         } else {
             collected += std::char_traits<char>::to_char_type(byte);
         }
+        collected += input.TakePlainText();
     }
 }
 
 void Reader::Escape(std::string& text) {
     static constexpr char letters[] = {'b', 'f', 'n', 'r', 't'};
     static constexpr char controls[] = {'\b', '\f', '\n', '\r', '\t'};
-    const int byte = Take();
-    if (byte == end || byte == 'u') {
+    const int byte = input.Take();
+    if (byte == InputBytes::end || byte == 'u') {
         return;
     }
     const char escaped = std::char_traits<char>::to_char_type(byte);
@@ -202,52 +153,51 @@ void Reader::Escape(std::string& text) {
 
 void Reader::Bool(bool& flag) {
     char bytes[5];
-    if (buffer.sgetn(bytes, sizeof bytes) != sizeof bytes) {
-        stream.setstate(std::ios_base::eofbit | std::ios_base::failbit);
-    } else if (std::memcmp(bytes, "true", 4) == 0) {
-        PutBack();
+    if (!input.Take(bytes, sizeof bytes)) {
+        return;
+    }
+    if (std::memcmp(bytes, "true", 4) == 0) {
+        input.PutBack();
         flag = true;
     } else if (std::memcmp(bytes, "false", 5) == 0) {
         flag = false;
     } else {
-        Fail();
+        input.Fail();
     }
 }
 
 void Reader::Null() {
     char bytes[4];
-    if (buffer.sgetn(bytes, sizeof bytes) != sizeof bytes) {
-        stream.setstate(std::ios_base::eofbit | std::ios_base::failbit);
-    } else if (std::memcmp(bytes, "null", sizeof bytes) != 0) {
-        Fail();
+    if (input.Take(bytes, sizeof bytes) && std::memcmp(bytes, "null", sizeof bytes) != 0) {
+        input.Fail();
     }
 }
 
 template <typename Item>
 void Reader::List(char open, char close, Item item) {
-    Expect(open);
+    input.Expect(open);
     ++depth;
     if (depth > deepest) {
-        Fail();
+        input.Fail();
     }
-    while (Good()) {
-        Accept(',');
+    while (input.Good()) {
+        input.Accept(',');
         Blanks();
-        if (!Good() || Peek() == close) {
+        if (!input.Good() || input.Peek() == close) {
             break;
         }
         item();
-        if (!Good()) {
+        if (!input.Good()) {
             break;
         }
         Blanks();
-        if (!Good() || !Accept(',')) {
+        if (!input.Good() || !input.Accept(',')) {
             break;
         }
     }
     --depth;
-    if (Good()) {
-        Expect(close);
+    if (input.Good()) {
+        input.Expect(close);
     }
 }
 
@@ -265,28 +215,40 @@ void Reader::Object(std::map<std::string, JsonValue>& members) {
 void Reader::Member(std::map<std::string, JsonValue>& members) {
     std::string key;
     String(key);
-    if (!Good()) {
+    if (!input.Good()) {
         return;
     }
     Blanks();
-    if (Good()) {
-        Expect(':');
+    if (input.Good()) {
+        input.Expect(':');
     }
-    if (Good()) {
-        JsonValue value;
-        Value(value);
-        members[key] = std::move(value);
+    if (input.Good()) {
+        const auto [member, isNew] = members.try_emplace(std::move(key));
+        if (!isNew) {
+            member->second = JsonValue();
+        }
+        Value(member->second);
     }
 }
 
 void Reader::Array(std::vector<JsonValue>& elements) {
-    std::vector<JsonValue> collected;
-    List('[', ']', [this, &collected] {
-        collected.emplace_back();
-        Value(collected.back());
+    const std::size_t first = pending.size();
+    List('[', ']', [this] {
+        JsonValue value;
+        Value(value);
+        pending.push_back(std::move(value));
     });
-    if (Good()) {
-        elements = std::move(collected);
+    if (!input.Good()) {
+        return;
+    }
+    if (first == 0) {
+        elements = std::move(pending);
+        pending.clear();
+    } else {
+        const auto begin = pending.begin() + static_cast<std::ptrdiff_t>(first);
+        elements = std::vector<JsonValue>(std::make_move_iterator(begin),
+                                          std::make_move_iterator(pending.end()));
+        pending.erase(begin, pending.end());
     }
 }
 

@@ -4,6 +4,7 @@
 #include <gtest/gtest.h>
 
 #include <istream>
+#include <sstream>
 
 #include "json/AllocationMeter.h"
 #include "json/JsonReader.h"
@@ -140,6 +141,43 @@ TEST(JsonCostTest, OneLargeComment) {
         EXPECT_EQ(cost.state, "read");
         EXPECT_LE(cost.operationsPerByte, fewOperations);
         EXPECT_LE(cost.heapPerByte, 0.01);
+    }
+}
+
+// In a buffer that holds the whole text ready no operation is counted: a reader that went to the
+// end of it over and over would not be done within the time that a test has.
+TEST(JsonCostTest, WholeTextReadyInTheBuffer) {
+    for (const std::string item : {"\\q\\n", "\\\"x", "x"}) {
+        std::istringstream stream("[\"" + RepeatedUpTo(item, large) + "\"]");
+        JsonValue value;
+        ReadValue(stream, value);
+        EXPECT_EQ(StateOf(stream), "read") << item;
+    }
+    for (const std::string item : {"1,", "-1.5e3 ,", "\"\",", "[],", "true,", " /**/ null,"}) {
+        std::istringstream stream("[" + RepeatedUpTo(item, large / 10) + "]");
+        JsonValue value;
+        ReadValue(stream, value);
+        EXPECT_EQ(StateOf(stream), "read") << item;
+    }
+}
+
+// Arrays in an array have no room to spare, but for one that nothing stands before.
+TEST(JsonCostTest, ManySmallArrays) {
+    constexpr std::size_t arrays = 10'000;
+    std::string text = "[";
+    for (std::size_t array = 0; array < arrays; ++array) {
+        text += "[1,2,3,4,5],";
+    }
+    std::istringstream stream(text + "]");
+    JsonValue value;
+    const AllocationMeter meter;
+    ReadValue(stream, value);
+    EXPECT_EQ(StateOf(stream), "read");
+    // The arrays' own elements, and the list of the arrays as it grows.
+    EXPECT_LE(meter.Bytes(), (5 + 4) * arrays * sizeof value);
+    ASSERT_EQ(value.elements.size(), arrays);
+    for (std::size_t array = 1; array < arrays; ++array) {
+        ASSERT_EQ(value.elements[array].elements.capacity(), 5U) << array;
     }
 }
 

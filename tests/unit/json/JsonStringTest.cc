@@ -56,6 +56,17 @@ TEST(JsonStringTest, EveryByteButQuoteAndBackslashIsTakenAsItIs) {
     EXPECT_EQ(StringOf("\"" + all + "\"x"), Accepted(Show(all), "x"));
 }
 
+// However far the end of a run of plain bytes is looked for at a time.
+TEST(JsonStringTest, TextOfAnyLengthMayStandBeforeAQuoteOrAnEscape) {
+    for (std::size_t length = 0; length <= 1100; length += length % 64 < 3 ? 1 : 61) {
+        const std::string plain(length, 'x');
+        EXPECT_EQ(StringOf("\"" + plain + "\" y"), Accepted("\"" + plain + "\"", " y"));
+        EXPECT_EQ(StringOf("\"" + plain + "\\\"" + plain + "\\q\""),
+                  Accepted("\"" + plain + "\"" + plain + "\\q\""));
+        EXPECT_EQ(StringOf("\"" + plain), Failed("\"old\""));
+    }
+}
+
 TEST(JsonStringTest, LineEndsMayStandInAString) {
     EXPECT_EQ(StringOf("\"a\nb\rc\""), Accepted(R"("a\x0ab\x0dc")"));
 }
