@@ -4,7 +4,9 @@
 #
 #     Builds the native plugin <name> as lib<name>.so, with none of its symbols visible to other
 #     plugins but the two that vantor reads, and installs it into VANTOR_PLUGIN_DIRECTORY. <name> is
-#     also the name of the CMake target.
+#     also the name of the CMake target. A function that no library has is an error of the link: at
+#     boot it would end the boot. For a plugin that calls what another one exports, add the link
+#     option -Wl,-z,undefs.
 #
 # vantor::plugin              the header vantor/plugin.h, for targets made in another way
 # VANTOR_PLUGIN_DIRECTORY     where plugins of every kind belong
@@ -26,6 +28,7 @@ function(vantor_add_plugin name)
     endif()
     add_library(${name} MODULE ${arg_SOURCES})
     target_link_libraries(${name} PRIVATE vantor::plugin)
+    target_link_options(${name} PRIVATE -Wl,-z,defs)
     set_target_properties(${name} PROPERTIES
         PREFIX lib OUTPUT_NAME ${name} SUFFIX .so
         C_VISIBILITY_PRESET hidden

@@ -102,6 +102,15 @@ def test_parallel_comes_from_the_defaults_file(machine):
         assert injections == [f"debug injection '{name}' returned 0x000100" for name in gave_up]
 
 
+def test_a_mistake_in_the_options_does_not_keep_the_host_from_booting(machine):
+    machine.write(DEFAULTS, "VANTOR_OPTIONS='--trace --parallel'\n")
+    seen = boot(machine)
+    assert seen.status == 0
+    assert "plugin second" in seen.notes
+    assert (f"vantor: {DEFAULTS}: VANTOR_OPTIONS: unrecognized option '--trace --parallel'; "
+            "booting without them\n") in seen.stderr
+
+
 def test_the_scripts_status_is_the_programs(machine):
     machine.write(DEFAULTS, "VANTOR_OPTIONS=--plugin-directory=/nowhere\n")
     seen = boot(machine)

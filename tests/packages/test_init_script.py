@@ -106,6 +106,19 @@ def test_settings_may_be_computed(script):
     assert script.boot() == (["--init", "--parallel", "--run-once=identity1.2,setup3,"], "")
 
 
+def test_options_that_the_program_does_not_take_are_left_out(script):
+    script.install_program(
+        "for word; do case $word in --trce)",
+        "    echo \"$0: unrecognized option '$word'\" >&2; echo Try --help. >&2; exit 1",
+        "esac; done",
+        "printf '<%s>' \"$@\"")
+    script.set_defaults("VANTOR_PARALLEL=yes\nVANTOR_OPTIONS='\n--verbose\n--trce\n'\n")
+    assert script.boot() == (
+        ["--init", "--parallel", "--run-once=identity1.2,setup3,"],
+        f"vantor: {script.defaults}: VANTOR_OPTIONS: unrecognized option '--trce'; "
+        "booting without them\n")
+
+
 def test_the_environment_sets_nothing(script):
     done = script.call("start", VANTOR_PARALLEL="yes", VANTOR_PLUGIN_FLAGS="debug",
                        VANTOR_OPTIONS="--trace")
