@@ -1,0 +1,1 @@
+"""The parts of scripts/bench: workloads, measurements in pairs, and the report."""

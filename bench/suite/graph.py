@@ -1,0 +1,93 @@
+"""Groups "graph" and "memory": the graph and its executor alone, beside oneTBB's flow graph."""
+
+import statistics
+
+from suite.results import Curve
+
+GROUP = "graph"
+SHAPES = ["independent", "layered", "chain"]
+PROGRAMS = {"vantor": "vantor", "flow": "oneTBB"}
+
+
+def _limit(shape, workers):
+    if shape == "independent":
+        return 0.5
+    return 1.5 if workers == 1 else 3.0
+
+
+def _per_node(host, *arguments):
+    """The last argument but the workers is the number of nodes."""
+    count = next(word for word in reversed(arguments) if isinstance(word, int) and word > 8)
+    return host.run_own("bench-graph", *arguments)["nanoseconds"] / count
+
+
+def _check(host, count):
+    for shape in SHAPES:
+        for program in PROGRAMS:
+            for workers in (1, 8):
+                host.run_own("bench-graph", "check", program, shape, count, workers)
+
+
+def _measure_shape(host, results, shape, counts):
+    keys = [(program, workers, count)
+            for count in counts for workers in (1, 8) for program in PROGRAMS]
+    figures = results.alternate(f"{GROUP}: {shape}", {
+        key: lambda key=key: _per_node(host, "run", key[0], shape, key[2], key[1]) for key in keys})
+    for count in counts:
+        for workers in (1, 8):
+            results.compare(GROUP, f"{count:,} nodes, {shape}, {_workers(workers)}", "ns/node",
+                            ("vantor", figures["vantor", workers, count]),
+                            ("oneTBB", figures["flow", workers, count]), _limit(shape, workers))
+    small, large = counts[-1] // 100 if counts[-1] // 100 in counts else counts[0], counts[-1]
+    for workers in (1, 8):
+        results.compare(GROUP, f"{shape}, {_workers(workers)}, from {small:,} to {large:,} nodes",
+                        "ns/node", (f"vantor, {large:,}", figures["vantor", workers, large]),
+                        (f"vantor, {small:,}", figures["vantor", workers, small]), 2.0)
+    if shape == "chain":
+        for count in counts:
+            results.compare(GROUP, f"chain of {count:,} nodes, 8 workers beside 1", "ns/node",
+                            ("vantor, 8 workers", figures["vantor", 8, count]),
+                            ("vantor, 1 worker", figures["vantor", 1, count]), 3.0)
+    series = {f"{PROGRAMS[program]}, {_workers(workers)}":
+              [(count, statistics.median(figures[program, workers, count])) for count in counts]
+              for program in PROGRAMS for workers in (1, 8)}
+    results.curves.append(Curve(f"graph-{shape}", f"Empty nodes, {shape}", "nodes", "ns a node",
+                                series))
+
+
+def _workers(count):
+    return "1 worker" if count == 1 else f"{count} workers"
+
+
+def _measure_long_chain(host, results, count):
+    figures = results.alternate(f"{GROUP}: chain of {count:,}", {
+        "requested from its first node": lambda: _per_node(host, "schedule", "near", count),
+        "requested from its last node": lambda: _per_node(host, "schedule", "far", count),
+        "height of its first node": lambda: _per_node(host, "height", count),
+    })
+    for what, values in figures.items():
+        results.figure(GROUP, f"chain of {count:,} nodes, {what}", "vantor", values, "ns/node")
+
+
+def measure(host, results):
+    counts = [1000, 10000] if results.quick else [1000, 10000, 100000, 1000000]
+    results.progress.say(f"{GROUP}: check")
+    _check(host, 1000)
+    for shape in SHAPES:
+        _measure_shape(host, results, shape, counts)
+    _measure_long_chain(host, results, counts[-1])
+
+
+def measure_memory(host, results):
+    """The bytes by which the process grows, beside those that the nodes and names are made of."""
+    count = 10000 if results.quick else 100000
+    for kind, label, limit in (("plugin", "debug plugins", 1.2), ("barrier", "barriers", 1.2),
+                               ("graph", "plugins and barriers, linked", None)):
+        grown, own = [], []
+        for number in range(results.rounds):
+            results.progress.say(f"memory: {label}, round {number + 1} of {results.rounds}")
+            figures = host.run_own("bench-graph", "memory", kind, count)
+            grown.append(figures["resident"] / count)
+            own.append(figures["own"] / count)
+        results.compare("memory", f"{count:,} {label}", "bytes/node", ("resident", grown),
+                        ("nodes and names", own), limit)

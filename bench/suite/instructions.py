@@ -1,0 +1,87 @@
+"""Group "instructions": how many instructions the single-threaded parts execute.
+
+Counted by callgrind, so a noisy machine does not change them: a regression shows at once.
+"""
+
+import re
+import subprocess
+
+from harness.private_root import PLUGINS
+
+from suite.host import VANTOR
+from suite.loading import lay_out_plugins, write_documents
+from suite.results import BenchError
+
+GROUP = "instructions"
+_VALGRIND = ["--tool=callgrind", "--callgrind-out-file=/dev/null"]
+
+
+def _collected(errors):
+    found = re.search(r"Collected\s*:\s*(\d+)", errors)
+    if not found:
+        raise BenchError(f"callgrind says no count: {errors[-300:]}")
+    return int(found[1])
+
+
+def _count_part(host, program, *arguments):
+    """Instructions of the part that a measuring program marks."""
+    command = ["valgrind", *_VALGRIND, "--instr-atstart=no", host.program(program),
+               *map(str, arguments)]
+    done = subprocess.run(command, capture_output=True, text=True, check=False)
+    if done.returncode != 0:
+        raise BenchError(f"{program} under callgrind: {done.stderr[-300:]}")
+    return _collected(done.stderr)
+
+
+def _count_whole(host, *command):
+    """Instructions of a whole run in the private root, its children not included."""
+    return _collected(host.errors_of("/usr/bin/valgrind", "--vgdb=no", *_VALGRIND, *command))
+
+
+def _graph(host, results, count):
+    for shape in ("independent", "layered", "chain"):
+        results.progress.say(f"{GROUP}: {shape} graph")
+        ours, theirs = ([_count_part(host, "bench-graph", "run", program, shape, count, 1) / count]
+                        for program in ("vantor", "flow"))
+        results.compare(GROUP, f"{count:,} empty nodes, {shape}, 1 worker", "per node",
+                        ("vantor", ours), ("oneTBB", theirs))
+    for what, arguments in (("requested from its first node", ("schedule", "near", count)),
+                            ("requested from its last node", ("schedule", "far", count)),
+                            ("height of its first node", ("height", count))):
+        results.figure(GROUP, f"chain of {count:,} nodes, {what}", "vantor",
+                       [_count_part(host, "bench-graph", *arguments) / count], "per node")
+
+
+def _json(host, results, folder):
+    small, large = write_documents(folder, 100, 200000)
+    for label, paths in (("100 documents of 0.5 to 4 KB", small), ("a document of 0.2 MB", large)):
+        results.progress.say(f"{GROUP}: {label}")
+        size = host.run_own("bench-json", "reader", 1, *paths)["bytes"]
+        ours, theirs = ([_count_part(host, "bench-json", reader, 1, *paths) / size]
+                        for reader in ("reader", "dom"))
+        results.compare(GROUP, f"{label}, read from files", "per byte", ("vantor's reader", ours),
+                        ("nlohmann-json", theirs))
+
+
+def _loading(host, results, count):
+    host.clear_plugins()
+    results.progress.say(f"{GROUP}: whole boots")
+    empty = _count_whole(host, VANTOR)
+    bare_empty = _count_whole(host, "/usr/bin/bare-loading", PLUGINS, "0")
+    results.figure(GROUP, "boot of an empty directory", "vantor", [empty], "a run")
+    lay_out_plugins(host, count)
+    ours = (_count_whole(host, VANTOR) - empty) / count
+    theirs = (_count_whole(host, "/usr/bin/bare-loading", PLUGINS, str(count)) - bare_empty) / count
+    results.compare(GROUP, f"{count} native plugins, loaded and run", "per plugin",
+                    ("vantor", [ours]), ("bare dlopen loop", [theirs]))
+    host.clear_plugins()
+    host.root.debug_configuration(*(f"p{number}: : :true" for number in range(count)))
+    results.figure(GROUP, f"{count} debug plugins, loaded and run", "vantor",
+                   [(_count_whole(host, VANTOR) - empty) / count], "per plugin")
+    host.clear_plugins()
+
+
+def measure(host, results, folder):
+    _graph(host, results, 1000 if results.quick else 10000)
+    _json(host, results, folder)
+    _loading(host, results, 20 if results.quick else 200)

@@ -1,0 +1,109 @@
+"""What was measured: rows of a table and curves, and the way in which pairs are measured."""
+
+import statistics
+import sys
+import time
+from dataclasses import dataclass, field
+
+
+class BenchError(Exception):
+    """A measured program that failed, or did not do what it was measured for."""
+
+
+@dataclass
+class Row:
+    """A figure of ours, with the figure it is compared with if there is one.
+
+    ratios  ours divided by the other, one for each round
+    limit   what the ratio is to stay at or below; None where nothing is asked
+    """
+
+    group: str
+    work: str
+    subject: str
+    value: float
+    unit: str
+    reference: str = ""
+    reference_value: float = 0.0
+    ratios: list = field(default_factory=list)
+    limit: float = None
+
+    @property
+    def ratio(self):
+        return statistics.median(self.ratios) if self.ratios else None
+
+    @property
+    def quartiles(self):
+        if len(self.ratios) < 2:
+            return (self.ratios * 2)[:2] or None
+        low, _, high = statistics.quantiles(self.ratios, n=4, method="inclusive")
+        return low, high
+
+    @property
+    def verdict(self):
+        if self.limit is None or not self.ratios:
+            return ""
+        return "kept" if self.ratio <= self.limit else "missed"
+
+
+@dataclass
+class Curve:
+    """Lines over sizes: series maps a name to its points (size, value)."""
+
+    name: str
+    title: str
+    x_label: str
+    y_label: str
+    series: dict
+
+
+class Progress:
+    """One line on standard error that says what is being measured."""
+
+    def __init__(self):
+        self._start, self._width = time.monotonic(), 0
+
+    def say(self, text):
+        seconds = int(time.monotonic() - self._start)
+        line = f"bench: {seconds // 60}:{seconds % 60:02} {text}"
+        if sys.stderr.isatty():
+            sys.stderr.write("\r" + line.ljust(self._width))
+            self._width = len(line)
+        else:
+            sys.stderr.write(line + "\n")
+        sys.stderr.flush()
+
+    def end(self):
+        if sys.stderr.isatty():
+            sys.stderr.write("\n")
+
+
+class Results:
+    """Collects the rows and curves of all groups; the groups measure through it."""
+
+    def __init__(self, rounds, quick):
+        self.rounds, self.quick = rounds, quick
+        self.progress, self.rows, self.curves, self.failures = Progress(), [], [], []
+
+    def alternate(self, what, candidates):
+        """Measures every candidate once a round, in turning order; a list of figures for each.
+
+        candidates  name -> function that measures once and returns the figure
+        """
+        figures = {name: [] for name in candidates}
+        order = list(candidates)
+        for number in range(self.rounds):
+            self.progress.say(f"{what}, round {number + 1} of {self.rounds}")
+            for name in order if number % 2 == 0 else reversed(order):
+                figures[name].append(candidates[name]())
+        return figures
+
+    def figure(self, group, work, subject, values, unit):
+        """Reports a figure that is compared with nothing."""
+        self.rows.append(Row(group, work, subject, statistics.median(values), unit))
+
+    def compare(self, group, work, unit, ours, theirs, limit=None):
+        """Reports a pair. `ours` and `theirs` are (name, figures of the same rounds)."""
+        ratios = [one / other for one, other in zip(ours[1], theirs[1])]
+        self.rows.append(Row(group, work, ours[0], statistics.median(ours[1]), unit, theirs[0],
+                             statistics.median(theirs[1]), ratios, limit))

@@ -1,0 +1,93 @@
+"""Tests of what the figures rest on: python3 -B -m pytest -p no:cacheprovider bench"""
+
+import os
+import sys
+
+import pytest
+
+HERE = os.path.dirname(os.path.abspath(__file__))
+sys.path[:0] = [HERE, os.path.join(HERE, "..", "tests", "system")]
+
+# pylint: disable=wrong-import-position
+from suite.command_graphs import CommandGraph  # noqa: E402
+from suite.makespan import random_plugins  # noqa: E402
+from suite.plot import svg  # noqa: E402
+from suite.results import Curve, Results, Row  # noqa: E402
+from suite.simulation import SleepingPlugin, lower_bound, makespan  # noqa: E402
+
+
+def chain_beside_two():
+    """One plugin of 10 that another of 20 waits for, loaded after two of 15 that stand alone."""
+    return [SleepingPlugin("alone", 15), SleepingPlugin("other", 15),
+            SleepingPlugin("first", 10, provides=["b"]), SleepingPlugin("then", 20, ["b"])]
+
+
+def test_the_highest_goes_first():
+    # With two workers "first" and "alone" begin. At 10 "other" is as high as "then" and older, so
+    # "then" begins at 15, when "alone" is done. With three, "then" begins at 10.
+    assert makespan(chain_beside_two(), 1) == 60
+    assert makespan(chain_beside_two(), 2) == 15 + 20
+    assert makespan(chain_beside_two(), 3) == 10 + 20
+
+
+def test_workers_that_take_at_once_begin_with_what_is_requested_first():
+    # "alone" and "other" from 0 to 15, then the two of the chain one after the other.
+    assert makespan(chain_beside_two(), 2, at_once=True) == 15 + 10 + 20
+
+
+def test_a_barrier_waits_for_all_who_provide_it():
+    plugins = [SleepingPlugin("quick", 1, provides=["b"]),
+               SleepingPlugin("slow", 9, provides=["b"]), SleepingPlugin("last", 5, ["b"])]
+    assert makespan(plugins, 8) == 14
+
+
+def test_no_schedule_is_quicker_than_the_lower_bound():
+    assert lower_bound(chain_beside_two(), 2) == 30
+    assert lower_bound(chain_beside_two(), 8) == 30
+    assert lower_bound(chain_beside_two(), 1) == 60
+    for seed in range(20):
+        plugins = random_plugins(seed, 100, 200000)
+        assert lower_bound(plugins, 8) <= makespan(plugins, 8)
+
+
+def test_a_seed_gives_the_same_plugins_again():
+    assert random_plugins(3, 50, 200000) == random_plugins(3, 50, 200000)
+    assert random_plugins(3, 50, 200000) != random_plugins(4, 50, 200000)
+
+
+@pytest.mark.parametrize("shape, line", [
+    ("independent", "p1: : :true"), ("chain", "p1:b0:b1:true"), ("layered", "p25:b0:b1:true")])
+def test_a_debug_configuration_puts_a_barrier_between_groups(shape, line):
+    lines = CommandGraph(shape, 60).debug_configuration("true").splitlines()
+    assert len(lines) == 60
+    assert line in lines
+
+
+def test_ninja_and_make_get_the_same_barriers():
+    graph = CommandGraph("layered", 40)
+    assert "build p20: run | b0\n" in graph.ninja("true")
+    assert "p20: b0\n\ttrue;\n" in graph.make("true")
+
+
+def test_a_ratio_is_the_median_over_the_rounds():
+    row = Row("group", "work", "ours", 3, "us", "theirs", 2, [1.0, 2.0, 9.0], limit=2.0)
+    assert row.ratio == 2.0
+    assert row.quartiles == (1.5, 5.5)
+    assert row.verdict == "kept"
+    row.limit = 1.9
+    assert row.verdict == "missed"
+
+
+def test_candidates_take_turns_in_turning_order():
+    order = []
+    results = Results(rounds=2, quick=True)
+    figures = results.alternate("turns", {name: lambda name=name: order.append(name) or len(order)
+                                          for name in "abc"})
+    assert order == list("abccba")
+    assert figures == {"a": [1, 6], "b": [2, 5], "c": [3, 4]}
+
+
+def test_a_drawing_holds_every_point():
+    drawn = svg(Curve("name", "A < B", "x", "y", {"one": [(1, 2), (10, 20)], "two": [(1, 3)]}))
+    assert drawn.count("<circle") == 3
+    assert "A &lt; B" in drawn
