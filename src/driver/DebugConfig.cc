@@ -6,6 +6,7 @@
 #include <cstddef>
 #include <fstream>
 #include <stdexcept>
+#include <utility>
 #include <vector>
 
 namespace vantor {
@@ -17,6 +18,7 @@ constexpr const char* whiteSpace = " \t\n\v\f\r";
 constexpr char escapeCharacter = '\\';
 constexpr char listSeparator = ',';
 constexpr const char* quoteCharacters = "\"'";
+constexpr const char* special = "\\\"'";  // the escape character and the quote characters
 
 std::string Trim(const std::string& text) {
     const std::size_t first = text.find_first_not_of(whiteSpace);
@@ -29,18 +31,39 @@ std::string Trim(const std::string& text) {
 // The tokenizer takes the end of the text for the end of an open quote.
 bool HasOpenQuote(const std::string& text) {
     bool open = false;
-    for (std::size_t i = 0; i < text.size(); ++i) {
+    for (std::size_t i = text.find_first_of(special); i != std::string::npos;
+         i = text.find_first_of(special, i + 1)) {
         if (text[i] == escapeCharacter) {
             ++i;
-        } else if (std::string(quoteCharacters).find(text[i]) != std::string::npos) {
+        } else {
             open = !open;
         }
     }
     return open;
 }
 
-// Throws std::runtime_error for an invalid escape and for an unterminated quote.
+// The items between separators, empty ones included.
+std::list<std::string> SplitPlainList(const std::string& text) {
+    std::list<std::string> items;
+    std::size_t start = 0;
+    for (std::size_t end = text.find(listSeparator); end != std::string::npos;
+         end = text.find(listSeparator, start)) {
+        items.push_back(text.substr(start, end - start));
+        start = end + 1;
+    }
+    items.push_back(text.substr(start));
+    return items;
+}
+
+// Throws std::runtime_error for an invalid escape and for an unterminated quote. The file is read
+// once for each plugin file, and most of its lists need no tokenizer.
 std::list<std::string> SplitEscapedList(const std::string& text) {
+    if (text.empty()) {
+        return {};
+    }
+    if (text.find_first_of(special) == std::string::npos) {
+        return SplitPlainList(text);
+    }
     using Separator = boost::escaped_list_separator<char>;
     const Separator separator(std::string(1, escapeCharacter), std::string(1, listSeparator),
                               quoteCharacters);
@@ -52,22 +75,26 @@ std::list<std::string> SplitEscapedList(const std::string& text) {
     return result;
 }
 
+// The parts between colons, without the empty ones.
 std::vector<std::string> SplitFields(const std::string& line) {
-    using Separator = boost::char_separator<char>;
-    const Separator separator(":");
-    const boost::tokenizer<Separator> fields(line, separator);
-    return {fields.begin(), fields.end()};
+    std::vector<std::string> fields;
+    for (std::size_t start = line.find_first_not_of(':'); start != std::string::npos;) {
+        const std::size_t end = line.find(':', start);
+        fields.push_back(line.substr(start, end - start));
+        start = line.find_first_not_of(':', end);
+    }
+    return fields;
 }
 
 // Appends the entry that `line` holds and returns true, or returns false for a malformed line.
 bool ParseEntry(const std::string& line, std::list<DebugEntry>& entries) {
-    const std::vector<std::string> fields = SplitFields(line);
+    std::vector<std::string> fields = SplitFields(line);
     if (fields.size() != 4) {
         return false;
     }
     try {
-        entries.push_back({fields[0], SplitEscapedList(Trim(fields[1])),
-                           SplitEscapedList(Trim(fields[2])), fields[3]});
+        entries.push_back({std::move(fields[0]), SplitEscapedList(Trim(fields[1])),
+                           SplitEscapedList(Trim(fields[2])), std::move(fields[3])});
     } catch (const std::runtime_error&) {
         return false;
     }

@@ -1,10 +1,12 @@
 #include "json/InputBytes.h"
 
-#include <algorithm>
-#include <charconv>
+#include <locale.h>
+#include <stdlib.h>
+
+#include <array>
+#include <cmath>
 #include <cstring>
 #include <locale>
-#include <system_error>
 
 namespace vantor {
 
@@ -13,6 +15,9 @@ namespace {
 // How far ahead the end of a plain text is looked for at a time: beyond the end of most strings,
 // and near enough to look again after each of many backslashes.
 constexpr std::size_t longestLook = 256;
+
+// Longer numbers are left to the extraction.
+constexpr std::size_t longestNumber = 63;
 
 bool IsBlank(int byte) { return byte == ' ' || (byte >= '\t' && byte <= '\r'); }
 
@@ -43,6 +48,13 @@ std::string_view NumberAtBeginning(std::string_view text) {
         skipDigits();
     }
     return text.substr(0, static_cast<std::size_t>(next - text.data()));
+}
+
+// By the very function that the extraction of a double ends in, strtod_l(3): std::from_chars() of
+// the 32-bit library may differ from it in the last bit.
+double ConvertAsExtractionDoes(const char* text, char*& stop) {
+    static const locale_t classic = newlocale(LC_ALL_MASK, "C", nullptr);
+    return strtod_l(text, &stop, classic);
 }
 
 }  // namespace
@@ -104,13 +116,15 @@ void InputBytes::Number(double& number) {
 bool InputBytes::NumberFromGetArea(double& number) {
     const std::string_view area = GetArea::Of(buffer);
     const std::string_view text = NumberAtBeginning(area);
-    if (text.size() == area.size()) {
+    std::array<char, longestNumber + 1> digits;
+    if (text.empty() || text.size() == area.size() || text.size() > longestNumber) {
         return false;
     }
-    const char* const textEnd = text.data() + text.size();
-    double converted = 0.0;
-    const auto [stop, error] = std::from_chars(text.data(), textEnd, converted);
-    if (error != std::errc() || stop != textEnd) {
+    std::memcpy(digits.data(), text.data(), text.size());
+    digits[text.size()] = '\0';
+    char* stop = nullptr;
+    const double converted = ConvertAsExtractionDoes(digits.data(), stop);
+    if (stop != digits.data() + text.size() || !std::isfinite(converted)) {
         return false;
     }
     GetArea::Skip(buffer, text.size());
