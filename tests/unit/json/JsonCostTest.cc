@@ -21,7 +21,7 @@ using support::CountingBuffer;
 using support::StateOf;
 
 // A step too many for each byte before it shows at either size.
-constexpr std::size_t large = support::underSanitizers ? 1'000'000 : 10'000'000;
+constexpr std::size_t large = support::underSanitizers ? 3'000'000 : 10'000'000;
 
 std::string RepeatedUpTo(const std::string& text, std::size_t size) {
     std::string repeated;
