@@ -51,7 +51,7 @@ void Executor::StartWorkers(std::int32_t threadCount) {
                             std::to_string(threads.size()) + " created, " +
                             std::to_string(threadCount) + "requested)");
         }
-        start.release();  // NOLINT(bugprone-unused-return-value): the worker owns it now
+        static_cast<void>(start.release());  // the worker owns it now
         threads.push_back(thread);
     }
 }

@@ -6,6 +6,7 @@ import re
 
 import pexpect
 import pytest
+from harness.messages import NVCLI_USAGE
 
 # Words that no completion produces, to see where the prompt and an answer end.
 PROMPT, END = "@prompt@", "@end@"
@@ -15,16 +16,7 @@ OPTIONS = [
     "--dump-dependency-tree", "--interactive-mode-requires=", "--run-once=",
     "--plugin-directory=",
 ]
-PAGE = """\
-Usage: nvcli [OPTION]... NAMESPACE... COMMAND [COMMAND'S OPTION]...
-
-Runs one of the management commands that this host describes.
-
-Options:
-  --directory=DIR  Know the commands described in DIR, in place of the host's; may be repeated
-  -h, --help       Show this page, or that of a namespace or a command: nvcli WORD... --help
-  --version        Show the version
-
+PAGE = NVCLI_USAGE + """
 Commands without a namespace:
   reboot  Starts over
 

@@ -4,6 +4,7 @@ import pytest
 
 from harness.json_plugin import (
     DIRECTORIES, NVCLI, command, describe, describe_notes, make_directories, option, shell_command)
+from harness.messages import NVCLI_USAGE
 
 
 @pytest.fixture
@@ -20,24 +21,12 @@ def nvcli(root, vantor):
     return run
 
 
-USAGE = """\
-Usage: nvcli [OPTION]... NAMESPACE... COMMAND [COMMAND'S OPTION]...
-
-Runs one of the management commands that this host describes.
-
-Options:
-  --directory=DIR  Know the commands described in DIR, in place of the host's; may be repeated
-  -h, --help       Show this page, or that of a namespace or a command: nvcli WORD... --help
-  --version        Show the version
-"""
-
-
 @pytest.mark.parametrize("words", [[], ["--help"], ["-h"]])
 def test_it_lists_every_namespace_and_command(root, nvcli, words):
     describe_notes(root)
     describe(root, command("net firewall set", "/usr/bin/true", summary="Opens a port"),
              command("reboot", "/usr/bin/true", summary="Starts again"), directory=DIRECTORIES[3])
-    assert nvcli(*words) == (0, USAGE + """
+    assert nvcli(*words) == (0, NVCLI_USAGE + """
 Commands without a namespace:
   reboot  Starts again
 
@@ -51,7 +40,7 @@ test:
 
 
 def test_a_host_that_describes_nothing(nvcli):
-    assert nvcli() == (0, USAGE + "\nNo command is described.\n", "")
+    assert nvcli() == (0, NVCLI_USAGE + "\nNo command is described.\n", "")
 
 
 def test_the_page_of_a_namespace(root, nvcli):
@@ -151,7 +140,7 @@ def test_bad_descriptions_are_reported_and_the_command_is_what_counts(root, nvcl
 def test_a_missing_directory_that_was_named_is_reported(root, nvcli):
     make_directories(root)
     status, output, errors = nvcli("--directory=/none", "--help")
-    assert (status, output) == (1, USAGE + "\nNo command is described.\n")
+    assert (status, output) == (1, NVCLI_USAGE + "\nNo command is described.\n")
     assert errors == "nvcli: /none: cannot read the directory: No such file or directory\n"
 
 

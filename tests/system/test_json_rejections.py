@@ -156,21 +156,7 @@ def test_versions_that_are_known(root, vantor, version):
 @pytest.mark.parametrize("kind", ["fifo", "socket", "folder", "dangling link", "link to itself",
                                   "link to a fifo", "device"])
 def test_an_entry_that_is_no_file(root, vantor, kind):
-    name = f"{PLUGINS}/x.json"
-    if kind == "fifo":
-        root.fifo(name)
-    elif kind == "socket":
-        root.socket(name)
-    elif kind == "folder":
-        root.folder_at(name)
-    elif kind == "dangling link":
-        root.symlink("nowhere", name)
-    elif kind == "link to itself":
-        root.symlink("x.json", name)
-    elif kind == "link to a fifo":
-        root.fifo("/tmp/fifo")
-        root.symlink("/tmp/fifo", name)
-    elif not root.device(name, "zero"):
+    if not root.odd_entry(f"{PLUGINS}/x.json", kind):
         pytest.skip("no device file can be made here")
     assert_refused(root, vantor(), NO_FILE)
 

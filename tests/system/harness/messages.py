@@ -28,3 +28,14 @@ def invalid(file_name, reason, folder=PLUGINS):
 def linker_says(file_name, what, folder=PLUGINS):
     """As invalid(), with a reason of the dynamic linker's."""
     return invalid(file_name, f"{folder}/{file_name}: {what}", folder)
+
+NVCLI_USAGE = """\
+Usage: nvcli [OPTION]... NAMESPACE... COMMAND [COMMAND'S OPTION]...
+
+Runs one of the management commands that this host describes.
+
+Options:
+  --directory=DIR  Know the commands described in DIR, in place of the host's; may be repeated
+  -h, --help       Show this page, or that of a namespace or a command: nvcli WORD... --help
+  --version        Show the version
+"""

@@ -104,6 +104,22 @@ class PrivateRoot:
         content = PluginFactory.compile(text, language, *options)
         self.write(f"{PLUGINS}/lib{name}.so", content, 0o755)
 
+    def odd_entry(self, name, kind):
+        """Makes something that is no regular file; False where that is not allowed."""
+        if kind == "device":
+            return self.device(name, "zero")
+        if kind == "link to a fifo":
+            self.fifo("/tmp/fifo")
+        {
+            "fifo": lambda: self.fifo(name),
+            "socket": lambda: self.socket(name),
+            "folder": lambda: self.folder_at(name),
+            "dangling link": lambda: self.symlink("nowhere", name),
+            "link to itself": lambda: self.symlink(os.path.basename(name), name),
+            "link to a fifo": lambda: self.symlink("/tmp/fifo", name),
+        }[kind]()
+        return True
+
     def device(self, name, kind):
         """Makes a device file; False where that is not allowed."""
         return self.isolation.make_device(self.path(name), kind)

@@ -154,7 +154,7 @@ TEST_P(CommandRunnerTest, StandardInputIsTheNullDevice) {
 }
 
 TEST_P(CommandRunnerTest, NoOtherDescriptorIsInherited) {
-    const int inheritable = open("/dev/null", O_RDONLY);  // NOLINT(*-cloexec-open)
+    const int inheritable = open("/dev/null", O_RDONLY);
     const ProcessResult result = RunProgram({"/bin/ls", "/proc/self/fd"});
     close(inheritable);
     EXPECT_EQ(result.standardOutput.Text(), "0\n1\n2\n3\n");  // 3 is the folder that it lists

@@ -135,7 +135,8 @@ int __wrap_execve(const char* path, char* const* arguments, char* const* environ
 
 // The linker's wrappers do not reach into the C++ library; a definition in the program does. Its
 // file streams open by this function.
-FILE* fopen64(const char* path, const char* mode) {  // NOLINT(readability-identifier-naming)
+// NOLINTNEXTLINE(readability-identifier-naming): the C library's name
+FILE* fopen64(const char* path, const char* mode) {
     using Function = FILE* (*)(const char*, const char*);
     static const auto real = reinterpret_cast<Function>(dlsym(RTLD_NEXT, "fopen64"));
     return real(Redirect(path).c_str(), mode);
