@@ -25,7 +25,6 @@
 
 #include "GraphShapes.h"
 #include "graph/Executor.h"
-#include "graph/GlobalLock.h"
 #include "graph/Node.h"
 
 namespace vantor::bench {
@@ -80,15 +79,7 @@ double RunVantor(const GraphShape& shape, int workers) {
         sequence.push_back(&node);
     }
     Executor executor(workers, false);
-    return Nanoseconds([&] {
-        {
-            const GlobalLockGuard guard;
-            for (Node* node : sequence) {
-                node->Schedule(executor);
-            }
-        }
-        Node::WaitAllDone(sequence);
-    });
+    return Nanoseconds([&] { Node::RunAll(sequence, executor); });
 }
 
 double RunOnce(const std::string& program, const GraphShape& shape, int workers) {

@@ -18,7 +18,6 @@
 #include "driver/RunOnceRecord.h"
 #include "graph/DotWriter.h"
 #include "graph/Executor.h"
-#include "graph/GlobalLock.h"
 #include "graph/InitBarrier.h"
 #include "graph/KeepUntilExit.h"
 #include "plugins/DebugPlugin.h"
@@ -134,14 +133,7 @@ bool MainDriver::DumpGraph() const {
 
 void MainDriver::RunGraph() {
     Executor executor(config.threads, config.randomize);
-    {
-        // No worker chooses before it can choose among all that is ready.
-        const GlobalLockGuard guard;
-        for (Plugin* node : nodes) {
-            node->Schedule(executor);
-        }
-    }
-    Node::WaitAllDone(nodes);
+    Node::RunAll(nodes, executor);
     WriteRunOnceRecord(options.runOncePlugins);
 }
 

@@ -91,11 +91,8 @@ void* Executor::WorkerEntry(void* argument) {
 void Executor::RunWorker() {
     GlobalLockGuard guard;
     while (!stopping) {
-        while (!queue.Empty()) {
-            Node& node = queue.TakeHighest(PickNext());
-            guard.Release();
-            node.Execute(*this);
-            guard.Retake();
+        while (HasReady()) {
+            TakeNext().Execute(*this, guard);
             if (stopping) {
                 return;
             }

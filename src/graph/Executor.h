@@ -17,9 +17,9 @@ class Node;
 // chain of work below it (its height) goes first, so that the critical path starts early; among
 // equals the one that has been ready longest, or a random one. One worker gives serial order.
 //
-// A run: construct the executor, Node::Schedule() every plugin in load order, Node::WaitDone() for
-// each in the same order, destroy the executor. The ready queue and the stop flag are guarded by
-// GlobalLock; `threads` belongs to the thread that constructs and destroys the executor.
+// A run: construct the executor, Node::RunAll() the plugins in load order, destroy the executor.
+// The ready queue and the stop flag are guarded by GlobalLock; `threads` belongs to the thread that
+// constructs and destroys the executor.
 class Executor {
 public:
     // Starts `threadCount` workers; none when it is below 1, and then no node is ever run. With
@@ -41,6 +41,12 @@ public:
     // Which node to run next: its position among the highest of the queue, counted from 0 in the
     // order in which they became ready. The caller holds GlobalLock, and the queue is not empty.
     std::size_t PickNext() const;
+
+    // Whether a node is ready, and the one to run next, taken out of the queue, which is not empty.
+    // For the workers, and for whoever takes their place in an executor without any. The caller
+    // holds GlobalLock.
+    bool HasReady() const { return !queue.Empty(); }
+    Node& TakeNext() { return queue.TakeHighest(PickNext()); }
 
 private:
     static void* WorkerEntry(void* argument);

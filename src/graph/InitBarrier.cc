@@ -1,19 +1,25 @@
 #include "graph/InitBarrier.h"
 
-#include <map>
-#include <memory>
+#include <boost/intrusive/set.hpp>
 
 #include "driver/RunConfig.h"
 #include "graph/GlobalLock.h"
-#include "graph/KeepUntilExit.h"
 #include "graph/SystemAlert.h"
 
 namespace vantor {
 
 namespace {
 
-// Guarded by GlobalLock. Its destruction at exit frees the entries, not the barriers.
-std::map<std::string, InitBarrier*> registry;
+struct NameOf {
+    using type = std::string;  // NOLINT(readability-identifier-naming): the set asks for it
+    const type& operator()(const InitBarrier& barrier) const { return barrier.Name(); }
+};
+
+// Ascending by name, compared byte by byte. Guarded by GlobalLock. The barriers are the entries, so
+// that a name is kept once; its destruction at exit leaves them as they are.
+using Registry = boost::intrusive::set<InitBarrier, boost::intrusive::key_of_value<NameOf>,
+                                       boost::intrusive::constant_time_size<false>>;
+Registry registry;
 
 }  // namespace
 
@@ -21,21 +27,21 @@ InitBarrier::InitBarrier(const std::string& barrierName) : Node(barrierName) {}
 
 InitBarrier* InitBarrier::Get(const std::string& barrierName) {
     const GlobalLockGuard guard;
-    const auto known = registry.find(barrierName);
-    if (known != registry.end()) {
-        return known->second;
+    Registry::insert_commit_data place;
+    const auto [known, isNew] = registry.insert_check(barrierName, place);
+    if (!isNew) {
+        return &*known;
     }
-    std::unique_ptr<InitBarrier> created(new InitBarrier(barrierName));
-    KeepUntilExit(*created);
-    registry.emplace(barrierName, created.get());
-    return created.release();
+    auto* const created = new InitBarrier(barrierName);
+    registry.insert_commit(*created, place);
+    return created;
 }
 
 std::list<InitBarrier*> InitBarrier::All() {
     const GlobalLockGuard guard;
     std::list<InitBarrier*> barriers;
-    for (const auto& entry : registry) {
-        barriers.push_back(entry.second);
+    for (InitBarrier& barrier : registry) {
+        barriers.push_back(&barrier);
     }
     return barriers;
 }

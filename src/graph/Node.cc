@@ -10,6 +10,14 @@
 
 namespace vantor {
 
+namespace {
+
+void Remove(Node::Edges& edges, const Node* node) {
+    edges.erase(std::remove(edges.begin(), edges.end(), node), edges.end());
+}
+
+}  // namespace
+
 Node::Node(std::string nodeName) : name(std::move(nodeName)) {
     if (pthread_cond_init(&doneCondition, nullptr) != 0) {
         throw Exception("Condition variable for Node could not be initialized");
@@ -19,10 +27,10 @@ Node::Node(std::string nodeName) : name(std::move(nodeName)) {
 Node::~Node() {
     const GlobalLockGuard guard;
     for (Node* dependency : dependencies) {
-        dependency->dependents.remove(this);
+        Remove(dependency->dependents, this);
     }
     for (Node* dependent : dependents) {
-        dependent->dependencies.remove(this);
+        Remove(dependent->dependencies, this);
     }
     pthread_cond_destroy(&doneCondition);
 }
@@ -46,6 +54,10 @@ void Node::AddDependent(Node& other) {
 
 void Node::Schedule(Executor& executor) {
     const GlobalLockGuard guard;
+    ScheduleLocked(executor);
+}
+
+void Node::ScheduleLocked(Executor& executor) {
     if (state == NodeState::Idle) {
         Request(executor);
     } else if (state == NodeState::Waiting) {
@@ -66,7 +78,7 @@ void Node::Request(Executor& executor) {
             node->BecomeWaiting();
             continue;
         }
-        node->firstUndone = node->dependencies.cbegin();
+        node->settled = 0;
         node->QueueIfReady(executor);
         if (requesters.empty()) {
             return;
@@ -78,12 +90,12 @@ void Node::Request(Executor& executor) {
 
 void Node::BecomeWaiting() {
     state = NodeState::Waiting;
-    firstUndone = dependencies.cbegin();
+    settled = 0;
 }
 
 Node* Node::NextIdleDependency() {
-    while (firstUndone != dependencies.cend()) {
-        Node* const dependency = *firstUndone++;
+    while (settled != dependencies.size()) {
+        Node* const dependency = dependencies[settled++];
         if (dependency->state == NodeState::Idle) {
             return dependency;
         }
@@ -93,18 +105,19 @@ Node* Node::NextIdleDependency() {
 
 // A dependency that is done stays so: none is looked at again.
 void Node::QueueIfReady(Executor& executor) {
-    while (firstUndone != dependencies.cend() && (*firstUndone)->state == NodeState::Done) {
-        ++firstUndone;
+    while (settled != dependencies.size() && dependencies[settled]->state == NodeState::Done) {
+        ++settled;
     }
-    if (firstUndone == dependencies.cend()) {
+    if (settled == dependencies.size()) {
         state = NodeState::Queued;
         executor.Enqueue(*this);
     }
 }
 
-void Node::Execute(Executor& executor) {
+void Node::Execute(Executor& executor, GlobalLockGuard& guard) {
+    guard.Release();
     Run();
-    const GlobalLockGuard guard;
+    guard.Retake();
     state = NodeState::Done;
     for (Node* dependent : dependents) {
         if (dependent->state == NodeState::Waiting) {
@@ -147,24 +160,22 @@ std::int32_t Node::HeightLocked() {
 void Node::ComputeHeight() {
     struct Visit {
         Node* node;
-        Edges::const_iterator next;  // the dependent to look at
+        std::size_t next;  // the dependent to look at
     };
     std::vector<Visit> path;
     height = 0;
-    Visit visit{this, dependents.cbegin()};
+    Visit visit{this, 0};
     for (;;) {
         const Edges& edges = visit.node->dependents;
-        while (visit.next != edges.cend() && (*visit.next)->height >= 0) {
-            if ((*visit.next)->heightKnown) {
-                visit.node->height = std::max(visit.node->height, (*visit.next)->height);
+        for (; visit.next != edges.size() && edges[visit.next]->height >= 0; ++visit.next) {
+            if (edges[visit.next]->heightKnown) {
+                visit.node->height = std::max(visit.node->height, edges[visit.next]->height);
             }
-            ++visit.next;
         }
-        if (visit.next != edges.cend()) {
+        if (visit.next != edges.size()) {
             path.push_back(visit);
-            Node* const unknown = *visit.next;
-            unknown->height = 0;
-            visit = {unknown, unknown->dependents.cbegin()};
+            visit = {edges[visit.next], 0};
+            visit.node->height = 0;
             continue;
         }
         ++visit.node->height;

@@ -3,8 +3,10 @@
 
 #include <pthread.h>
 
+#include <boost/container/small_vector.hpp>
+#include <cstddef>
 #include <cstdint>
-#include <list>
+#include <iterator>
 #include <string>
 
 #include "graph/GlobalLock.h"
@@ -35,6 +37,10 @@ enum class NodeState : std::int32_t {
 // recurses, so that a chain may be as long as memory allows.
 class Node {
 public:
+    // The neighbours on one side, in the order in which the edges were added. Nearly every node has
+    // one at most, which then takes neither an allocation nor another place in memory.
+    using Edges = boost::container::small_vector<Node*, 1>;
+
     // Throws Exception when the condition variable cannot be initialised.
     explicit Node(std::string nodeName);
 
@@ -54,8 +60,8 @@ public:
     const std::string& Name() const { return name; }
 
     // These take no lock: who walks a list holds it.
-    const std::list<Node*>& Dependencies() const { return dependencies; }
-    const std::list<Node*>& Dependents() const { return dependents; }
+    const Edges& Dependencies() const { return dependencies; }
+    const Edges& Dependents() const { return dependents; }
 
     NodeState State() const;
 
@@ -72,20 +78,26 @@ public:
     void Schedule(Executor& executor);
 
     // Runs the node, marks it done and queues the requested dependents that were waiting for it
-    // alone. Called by a worker that took the node from the queue and does not hold the lock.
-    void Execute(Executor& executor);
+    // alone. Called by a worker that took the node from the queue. Its guard holds the lock, gives
+    // it up while the node runs and holds it again on return: the lock is taken once for the end of
+    // a node and the choice of the next.
+    void Execute(Executor& executor, GlobalLockGuard& guard);
 
     // Blocks until the node is done.
     void WaitDone();
 
-    // As WaitDone() for each of a sequence of pointers to nodes, in its order, but with the lock
-    // taken once: whoever waits for very many short nodes keeps it from the workers no more than
-    // needed.
+    // Requests every node of a sequence of pointers, in its order, and blocks until all are done.
+    // No worker chooses before all are requested. The calling thread must not hold the lock.
     template <typename Nodes>
-    static void WaitAllDone(const Nodes& nodes) {
+    static void RunAll(const Nodes& nodes, Executor& executor) {
         const GlobalLockGuard guard;
         for (Node* node : nodes) {
-            node->WaitDoneLocked();
+            node->ScheduleLocked(executor);
+        }
+        // What is requested last is mostly done last: from that end few nodes are found undone, and
+        // this thread is seldom woken to take the lock from the workers.
+        for (auto node = std::rbegin(nodes); node != std::rend(nodes); ++node) {
+            (*node)->WaitDoneLocked();
         }
     }
 
@@ -101,9 +113,8 @@ public:
 private:
     friend class ReadyQueue;  // chains the nodes that are ready through `nextReady`
 
-    using Edges = std::list<Node*>;
-
     // The caller of any of these holds the lock.
+    void ScheduleLocked(Executor& executor);
     void WaitDoneLocked();
     std::int32_t HeightLocked();
     void Request(Executor& executor);
@@ -116,11 +127,11 @@ private:
     std::int32_t height = -1;
     NodeState state = NodeState::Idle;
     std::string name;
-    std::list<Node*> dependencies;
-    std::list<Node*> dependents;
-    // Of a waiting node: the dependencies before it are done. While the node is being requested:
-    // those before it have been requested.
-    Edges::const_iterator firstUndone;
+    Edges dependencies;
+    Edges dependents;
+    // Of a waiting node: so many of its first dependencies are done. While the node is being
+    // requested: so many have been requested.
+    std::size_t settled = 0;
     Node* nextReady = nullptr;
     pthread_cond_t doneCondition;  // broadcast when the node becomes done through Execute()
 };

@@ -8,43 +8,54 @@ namespace vantor {
 
 void ReadyQueue::Push(Node& node) {
     const std::int32_t height = node.HeightLocked();
-    auto found = rows.lower_bound(height);
-    if (found == rows.end() || found->first != height) {
-        if (spare.empty()) {
-            found = rows.emplace_hint(found, height, Row());
-        } else {
-            spare.key() = height;
-            spare.mapped() = Row();
-            found = rows.insert(found, std::move(spare));
-        }
+    if (height > highestHeight && !Empty()) {
+        MakeRow(lower.cbegin(), highestHeight) = std::exchange(highest, Row());
     }
-    Row& row = found->second;
-    node.nextReady = nullptr;
-    if (row.last == nullptr) {
-        row.first = &node;
-    } else {
-        row.last->nextReady = &node;
+    if (height > highestHeight || Empty()) {
+        highestHeight = height;
     }
-    row.last = &node;
-    ++row.count;
+    Append(height == highestHeight ? highest : LowerRow(height), node);
 }
 
 Node& ReadyQueue::TakeHighest(std::size_t position) {
-    Row& row = rows.begin()->second;
     Node* before = nullptr;
-    Node* taken = row.first;
+    Node* taken = highest.first;
     for (; position > 0; --position) {
         before = taken;
         taken = taken->nextReady;
     }
-    (before == nullptr ? row.first : before->nextReady) = taken->nextReady;
-    if (taken == row.last) {
-        row.last = before;
+    (before == nullptr ? highest.first : before->nextReady) = taken->nextReady;
+    if (taken == highest.last) {
+        highest.last = before;
     }
-    if (--row.count == 0) {
-        spare = rows.extract(rows.begin());
+    --highest.count;
+    if (highest.count == 0 && !lower.empty()) {
+        spare = lower.extract(lower.cbegin());
+        highestHeight = spare.key();
+        highest = spare.mapped();
     }
     return *taken;
+}
+
+ReadyQueue::Row& ReadyQueue::LowerRow(std::int32_t height) {
+    const auto found = lower.lower_bound(height);
+    return found != lower.end() && found->first == height ? found->second : MakeRow(found, height);
+}
+
+ReadyQueue::Row& ReadyQueue::MakeRow(Rows::const_iterator before, std::int32_t height) {
+    if (spare.empty()) {
+        return lower.emplace_hint(before, height, Row())->second;
+    }
+    spare.key() = height;
+    spare.mapped() = Row();
+    return lower.insert(before, std::move(spare))->second;
+}
+
+void ReadyQueue::Append(Row& row, Node& node) {
+    node.nextReady = nullptr;
+    (row.count == 0 ? row.first : row.last->nextReady) = &node;
+    row.last = &node;
+    ++row.count;
 }
 
 }  // namespace vantor

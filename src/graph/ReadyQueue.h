@@ -18,14 +18,14 @@ class Node;
 // other. Guarded by GlobalLock: whoever calls an operation holds it.
 class ReadyQueue {
 public:
-    bool Empty() const { return rows.empty(); }
+    bool Empty() const { return highest.count == 0; }
 
     // Puts a node at the end of the row of its height, which is computed if it is not known yet.
     // Logarithmic in the number of rows.
     void Push(Node& node);
 
     // The number of nodes in the highest row. The queue is not empty.
-    std::size_t HighestCount() const { return rows.begin()->second.count; }
+    std::size_t HighestCount() const { return highest.count; }
 
     // Removes and returns the node at `position`, counted from 0 for the one that has been ready
     // longest, of the highest row, which has so many. Linear in `position`.
@@ -39,8 +39,15 @@ private:
     };
     using Rows = std::map<std::int32_t, Row, std::greater<>>;
 
-    Rows rows;              // none of them empty
-    Rows::node_type spare;  // of the row that became empty last: a chain needs one at each step
+    Row& LowerRow(std::int32_t height);  // made if there is none
+    Row& MakeRow(Rows::const_iterator before, std::int32_t height);
+    static void Append(Row& row, Node& node);
+
+    // The highest row stands apart: in chains and layers it is the only one.
+    std::int32_t highestHeight = 0;
+    Row highest;            // empty only when the queue is
+    Rows lower;             // the others, none of them empty
+    Rows::node_type spare;  // of the row that left `lower` last, for the next one that comes
 };
 
 }  // namespace vantor

@@ -4,9 +4,12 @@
 #include <stdlib.h>
 
 #include <array>
+#include <cfloat>
 #include <cmath>
+#include <cstdint>
 #include <cstring>
 #include <locale>
+#include <optional>
 
 namespace vantor {
 
@@ -50,11 +53,51 @@ std::string_view NumberAtBeginning(std::string_view text) {
     return text.substr(0, static_cast<std::size_t>(next - text.data()));
 }
 
+// A decimal without exponent and of few digits, as strtod(3) converts it: the digits as a whole
+// number and the power of ten are doubles without error, and their quotient is rounded once (W. D.
+// Clinger, How to Read Floating Point Numbers Accurately, 1990). Where the processor calculates in
+// a longer format it would be rounded twice: whole numbers only.
+std::optional<double> ConvertShort(std::string_view text) {
+    static constexpr double powers[] = {1e0, 1e1, 1e2,  1e3,  1e4,  1e5,  1e6,  1e7,
+                                        1e8, 1e9, 1e10, 1e11, 1e12, 1e13, 1e14, 1e15};
+    constexpr std::size_t mostDigits = std::size(powers) - 1;
+    const bool negative = text.front() == '-';
+    std::int64_t whole = 0;
+    std::size_t digits = 0;
+    std::size_t fraction = 0;
+    bool behindPoint = false;
+    for (const char byte : text.substr(negative ? 1 : 0, mostDigits + 2)) {
+        if (byte == '.') {
+            behindPoint = true;
+        } else if (IsDigit(byte)) {
+            whole = whole * 10 + (byte - '0');
+            ++digits;
+            fraction += behindPoint ? 1 : 0;
+        } else {
+            return std::nullopt;
+        }
+    }
+    if (digits == 0 || digits > mostDigits || (fraction != 0 && FLT_EVAL_METHOD != 0)) {
+        return std::nullopt;
+    }
+    const double number = static_cast<double>(whole) / powers[fraction];
+    return negative ? -number : number;
+}
+
 // By the very function that the extraction of a double ends in, strtod_l(3): std::from_chars() of
-// the 32-bit library may differ from it in the last bit.
-double ConvertAsExtractionDoes(const char* text, char*& stop) {
+// the 32-bit library may differ from it in the last bit. Nothing for what is not wholly a number,
+// and for one too large for a double.
+std::optional<double> ConvertAsExtractionDoes(std::string_view text) {
     static const locale_t classic = newlocale(LC_ALL_MASK, "C", nullptr);
-    return strtod_l(text, &stop, classic);
+    std::array<char, longestNumber + 1> digits;
+    std::memcpy(digits.data(), text.data(), text.size());
+    digits[text.size()] = '\0';
+    char* stop = nullptr;
+    const double number = strtod_l(digits.data(), &stop, classic);
+    if (stop != digits.data() + text.size() || !std::isfinite(number)) {
+        return std::nullopt;
+    }
+    return number;
 }
 
 }  // namespace
@@ -116,19 +159,18 @@ void InputBytes::Number(double& number) {
 bool InputBytes::NumberFromGetArea(double& number) {
     const std::string_view area = GetArea::Of(buffer);
     const std::string_view text = NumberAtBeginning(area);
-    std::array<char, longestNumber + 1> digits;
     if (text.empty() || text.size() == area.size() || text.size() > longestNumber) {
         return false;
     }
-    std::memcpy(digits.data(), text.data(), text.size());
-    digits[text.size()] = '\0';
-    char* stop = nullptr;
-    const double converted = ConvertAsExtractionDoes(digits.data(), stop);
-    if (stop != digits.data() + text.size() || !std::isfinite(converted)) {
+    std::optional<double> converted = ConvertShort(text);
+    if (!converted) {
+        converted = ConvertAsExtractionDoes(text);
+    }
+    if (!converted) {
         return false;
     }
     GetArea::Skip(buffer, text.size());
-    number = converted;
+    number = *converted;
     return true;
 }
 

@@ -7,6 +7,7 @@
 #include <unistd.h>
 
 #include <algorithm>
+#include <array>
 #include <cstdint>
 #include <cstring>
 
@@ -22,10 +23,27 @@ static_assert(sizeof(off_t) == 8, "a large file would be taken for an unreadable
 // NOLINTNEXTLINE(bugprone-reserved-identifier,readability-identifier-naming): the linker's name
 extern "C" const ElfW(Ehdr) __ehdr_start __attribute__((visibility("hidden")));
 
-// Reads `size` bytes at `offset`; false when the file does not hold them.
-bool ReadAt(int file, void* buffer, std::size_t size, std::uint64_t offset) {
-    return pread(file, buffer, size, static_cast<off_t>(offset)) == static_cast<ssize_t>(size);
-}
+// The file's headers, which mostly lie together at its beginning: that much is read at once.
+class Headers {
+public:
+    explicit Headers(int openFile)
+        : file(openFile), held(pread(file, beginning.data(), beginning.size(), 0)) {}
+
+    // Copies `size` bytes at `offset`; false when the file does not hold them.
+    bool ReadAt(void* buffer, std::size_t size, std::uint64_t offset) const {
+        const std::uint64_t end = held < 0 ? 0 : static_cast<std::uint64_t>(held);
+        if (size <= end && offset <= end - size) {
+            std::memcpy(buffer, beginning.data() + offset, size);
+            return true;
+        }
+        return pread(file, buffer, size, static_cast<off_t>(offset)) == static_cast<ssize_t>(size);
+    }
+
+private:
+    int file;  // not owned
+    std::array<char, 1024> beginning;
+    ssize_t held;  // negative when nothing could be read
+};
 
 bool HasIdentOfThisProcess(const unsigned char (&ident)[EI_NIDENT]) {
     const unsigned char* const own = __ehdr_start.e_ident;
@@ -53,14 +71,14 @@ bool LiesInside(const ElfW(Phdr) & segment, std::uint64_t fileSize) {
            (segment.p_offset <= fileSize && segment.p_filesz <= fileSize - segment.p_offset);
 }
 
-bool IsCutShort(int file, std::uint64_t fileSize) {
+bool IsCutShort(const Headers& headers, std::uint64_t fileSize) {
     ElfW(Ehdr) header;
-    if (!ReadAt(file, &header, sizeof header, 0) || !IsLoadable(header)) {
+    if (!headers.ReadAt(&header, sizeof header, 0) || !IsLoadable(header)) {
         return false;
     }
     for (std::uint64_t i = 0; i < header.e_phnum; ++i) {
         ElfW(Phdr) segment;
-        if (!ReadAt(file, &segment, sizeof segment, header.e_phoff + i * sizeof segment)) {
+        if (!headers.ReadAt(&segment, sizeof segment, header.e_phoff + i * sizeof segment)) {
             return false;  // the linker cannot read its table either and says so
         }
         if (segment.p_type == PT_LOAD && !LiesInside(segment, fileSize)) {
@@ -89,7 +107,8 @@ std::string ReasonNotToLoad(const std::string& path) {
         return "not a regular file";
     }
     const FileDescriptor file(open(path.c_str(), O_RDONLY | O_NONBLOCK | O_NOCTTY | O_CLOEXEC));
-    if (file.IsOpen() && IsCutShort(file.Get(), static_cast<std::uint64_t>(status.st_size))) {
+    if (file.IsOpen() &&
+        IsCutShort(Headers(file.Get()), static_cast<std::uint64_t>(status.st_size))) {
         return "file is truncated (a loadable segment lies beyond its end)";
     }
     return {};

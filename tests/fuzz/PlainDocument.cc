@@ -98,7 +98,7 @@ std::set<std::string> TextSet(const JsonValue& list) {
     return {texts.begin(), texts.end()};
 }
 
-std::list<std::string> Names(const std::list<Node*>& nodes) {
+std::list<std::string> Names(const Node::Edges& nodes) {
     std::list<std::string> names;
     for (const Node* node : nodes) {
         names.push_back(node->Name());

@@ -34,7 +34,7 @@ OPERATIONS = {
 COMPILERS = r"libstdc\+\+\.so\.6|libgcc_s\.so\.1|libm\.so\.6|libc\.so\.6|ld-linux.*\.so\.\d"
 PROGRAMS = COMPILERS + (
     r"|libnvkctl\.so|libnvkuser\.so|libbasekit\.so|libz\.so\.1"
-    r"|libboost_(filesystem|system|iostreams|regex)\.so\.1\.\d+\.0")
+    r"|libboost_(filesystem|system|iostreams)\.so\.1\.\d+\.0")
 
 
 @pytest.fixture(name="program")

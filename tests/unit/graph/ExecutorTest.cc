@@ -17,6 +17,7 @@ namespace vantor {
 
 namespace {
 
+using support::Execute;
 using support::Faults;
 using support::GraphText;
 using support::WaitUntil;
@@ -124,7 +125,7 @@ TEST_P(NoWorkersTest, ThreadCountBelow1CreatesNoWorkersAndWaitDoneBlocks) {
     EXPECT_FALSE(returned);
     EXPECT_EQ(graph["a"].State(), NodeState::Queued);
     // Nobody else will: the test does the worker's part, so that the waiter can leave.
-    graph["a"].Execute(executor);
+    Execute(graph["a"], executor);
     waiter.join();
 }
 

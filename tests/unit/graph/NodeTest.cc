@@ -185,19 +185,26 @@ TEST_F(NodeTest, OperationsMayBeCalledWithTheLockHeld) {
     EXPECT_TRUE(GlobalLock::HeldByCurrentThread());
 }
 
-TEST_F(NodeTest, WaitAllDoneReturnsWhenEveryNodeIsDone) {
+TEST_F(NodeTest, RunAllReturnsWhenEveryNodeIsDone) {
     GraphText graph({"a provides x", "b requires x", "c"});
     const std::vector<Node*> nodes = {&graph["a"], &graph["b"], &graph["c"]};
     Executor executor(2, false);
-    graph.Schedule(executor);
-    Node::WaitAllDone(nodes);
+    Node::RunAll(nodes, executor);
     for (const Node* node : nodes) {
         EXPECT_EQ(node->State(), NodeState::Done) << node->Name();
     }
 }
 
-TEST_F(NodeTest, WaitAllDoneDoesNotWaitForNothing) {
-    Node::WaitAllDone(std::vector<Node*>());
+TEST_F(NodeTest, RunAllRequestsEveryNodeBeforeAWorkerChooses) {
+    GraphText graph({"low", "high provides x", "last requires x"});
+    Executor executor(1, false);
+    Node::RunAll(std::vector<Node*>{&graph["low"], &graph["high"], &graph["last"]}, executor);
+    EXPECT_THAT(graph.Order(), ElementsAre("high", "low", "last"));
+}
+
+TEST_F(NodeTest, RunAllDoesNotWaitForNothing) {
+    Executor executor(0, false);
+    Node::RunAll(std::vector<Node*>(), executor);
     EXPECT_EQ(Faults().condWait.Calls(), 0);
 }
 

@@ -15,6 +15,7 @@ namespace vantor {
 
 namespace {
 
+using support::Execute;
 using support::Faults;
 using support::GraphText;
 using support::WaitUntil;
@@ -39,7 +40,7 @@ TEST_F(ScheduleTest, PluginRequiringABarrierWhoseProvidersAreAllDoneIsQueuedAtOn
     graph["a"].MarkDone();
     graph["b"].MarkDone();
     graph["c"].Schedule(executor);
-    graph.Barrier("x").Execute(executor);
+    Execute(graph.Barrier("x"), executor);
     EXPECT_EQ(graph["c"].State(), NodeState::Queued);
 
     graph["d"].Schedule(executor);
@@ -67,12 +68,12 @@ TEST_F(ScheduleTest, DependenciesAreRequestedBeforeThePluginThatWaitsForThem) {
 TEST_F(ScheduleTest, NodeIsQueuedByTheLastOfItsDependenciesToFinish) {
     GraphText graph({"a provides x", "b provides x", "c requires x"});
     graph["c"].Schedule(executor);
-    graph["b"].Execute(executor);
+    Execute(graph["b"], executor);
     EXPECT_EQ(graph.Barrier("x").State(), NodeState::Waiting);
-    graph["a"].Execute(executor);
+    Execute(graph["a"], executor);
     EXPECT_EQ(graph.Barrier("x").State(), NodeState::Queued);
     EXPECT_EQ(graph["c"].State(), NodeState::Waiting);
-    graph.Barrier("x").Execute(executor);
+    Execute(graph.Barrier("x"), executor);
     EXPECT_EQ(graph.Barrier("x").State(), NodeState::Done);
     EXPECT_EQ(graph["c"].State(), NodeState::Queued);
 }
@@ -94,8 +95,8 @@ TEST_F(ScheduleTest, WaitingNodeStaysWaitingHoweverOftenItIsRequested) {
         EXPECT_EQ(graph["b"].State(), NodeState::Waiting);
     }
     Faults().condBroadcast.Reset();
-    graph["a"].Execute(executor);
-    graph.Barrier("x").Execute(executor);
+    Execute(graph["a"], executor);
+    Execute(graph.Barrier("x"), executor);
     EXPECT_EQ(graph["b"].State(), NodeState::Queued);
 }
 
@@ -113,7 +114,7 @@ TEST_F(ScheduleTest, NodeStaysQueuedWhileItRunsAndIsDoneAfterwards) {
     NodeState whileRunning = NodeState::Idle;
     graph["a"].onRun = [&] { whileRunning = graph["a"].State(); };
     graph["a"].Schedule(executor);
-    graph["a"].Execute(executor);
+    Execute(graph["a"], executor);
     EXPECT_EQ(whileRunning, NodeState::Queued);
     EXPECT_EQ(graph["a"].State(), NodeState::Done);
 }
@@ -122,14 +123,14 @@ TEST_F(ScheduleTest, NodeRunsWithoutTheLock) {
     GraphText graph({"a"});
     bool held = true;
     graph["a"].onRun = [&] { held = GlobalLock::HeldByCurrentThread(); };
-    graph["a"].Execute(executor);
+    Execute(graph["a"], executor);
     EXPECT_FALSE(held);
 }
 
 TEST_F(ScheduleTest, DependentThatNobodyRequestedIsLeftAlone) {
     GraphText graph({"a provides x", "b requires x"});
     graph["a"].Schedule(executor);
-    graph["a"].Execute(executor);
+    Execute(graph["a"], executor);
     EXPECT_EQ(graph.Barrier("x").State(), NodeState::Idle);
     EXPECT_EQ(graph["b"].State(), NodeState::Idle);
 }
@@ -166,7 +167,7 @@ TEST_F(ScheduleTest, WaitDoneBlocksUntilTheNodeHasRun) {
     });
     EXPECT_TRUE(WaitUntil([] { return Faults().condWait.Calls() > 0; }));
     EXPECT_FALSE(returned);
-    graph["a"].Execute(executor);
+    Execute(graph["a"], executor);
     waiter.join();
     EXPECT_TRUE(returned);
 }
@@ -178,7 +179,7 @@ TEST_F(ScheduleTest, EveryWaiterIsWoken) {
         waiters.emplace_back([&] { graph["a"].WaitDone(); });
     }
     EXPECT_TRUE(WaitUntil([] { return Faults().condWait.Calls() == 5; }));
-    graph["a"].Execute(executor);
+    Execute(graph["a"], executor);
     for (std::thread& waiter : waiters) {
         waiter.join();
     }
@@ -191,7 +192,7 @@ TEST_F(ScheduleTest, WaitDoneSurvivesAWakeUpWithoutReason) {
     Faults().condWait.FailCall(1, 0);
     std::thread waiter([&] { graph["a"].WaitDone(); });
     EXPECT_TRUE(WaitUntil([] { return Faults().condWait.Calls() == 2; }));
-    graph["a"].Execute(executor);
+    Execute(graph["a"], executor);
     waiter.join();
     EXPECT_EQ(graph["a"].State(), NodeState::Done);
 }
@@ -200,7 +201,7 @@ TEST_F(ScheduleTest, WaitDoneSurvivesAWakeUpWithoutReason) {
 TEST_F(ScheduleTest, NodesOnACycleWaitForEverAndTheOthersRun) {
     GraphText graph({"a requires y provides x", "b requires x provides y", "c"});
     graph.Schedule(executor);
-    graph["c"].Execute(executor);
+    Execute(graph["c"], executor);
     EXPECT_EQ(graph["a"].State(), NodeState::Waiting);
     EXPECT_EQ(graph["b"].State(), NodeState::Waiting);
     EXPECT_EQ(graph.Barrier("x").State(), NodeState::Waiting);

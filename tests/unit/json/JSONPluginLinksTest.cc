@@ -37,7 +37,7 @@ protected:
         return std::any_of(all.begin(), all.end(),
                            [&name](const InitBarrier* barrier) { return barrier->Name() == name; });
     }
-    static std::vector<std::string> Names(const std::list<Node*>& nodes) {
+    static std::vector<std::string> Names(const Node::Edges& nodes) {
         std::vector<std::string> names;
         for (const Node* node : nodes) {
             names.push_back(node->Name());

@@ -44,7 +44,7 @@ std::uint32_t Ask(const std::string& path, const char* function) {
     return address();
 }
 
-std::vector<std::string> NamesOf(const std::list<Node*>& nodes) {
+std::vector<std::string> NamesOf(const Node::Edges& nodes) {
     const GlobalLockGuard guard;
     std::vector<std::string> names;
     for (const Node* node : nodes) {

@@ -19,7 +19,7 @@ bool IsLoaded(const std::string& path);
 std::uint32_t Ask(const std::string& path, const char* function);
 
 // The names of the nodes, in order.
-std::vector<std::string> NamesOf(const std::list<Node*>& nodes);
+std::vector<std::string> NamesOf(const Node::Edges& nodes);
 
 // Answers of dlsym(3) in place of the real ones while this object lives; one at a time.
 class SymbolSubstitutes {

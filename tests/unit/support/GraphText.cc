@@ -18,11 +18,9 @@ std::string NewPrefix() {
     return "g" + std::to_string(++graphs) + ".";
 }
 
-std::vector<const Node*> Pointers(const std::list<Node*>& nodes) {
-    return {nodes.begin(), nodes.end()};
-}
+std::vector<const Node*> Pointers(const Node::Edges& nodes) { return {nodes.begin(), nodes.end()}; }
 
-auto Count(const std::list<Node*>& nodes, const Node& node) {
+auto Count(const Node::Edges& nodes, const Node& node) {
     return std::count(nodes.begin(), nodes.end(), &node);
 }
 
@@ -43,6 +41,11 @@ void TestNode::Run() {
     if (onRun) {
         onRun();
     }
+}
+
+void Execute(Node& node, Executor& executor) {
+    GlobalLockGuard guard;
+    node.Execute(executor, guard);
 }
 
 void ExpectEdgesAgree(const Node& node) {

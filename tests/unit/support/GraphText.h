@@ -42,6 +42,9 @@ private:
     RunOrder& order;
 };
 
+// Does a worker's part for a node that it has taken from the queue.
+void Execute(Node& node, Executor& executor);
+
 // Fails the current test unless every edge of the node stands as often in the list of its other
 // end. Takes GlobalLock.
 void ExpectEdgesAgree(const Node& node);
