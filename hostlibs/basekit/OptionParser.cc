@@ -17,8 +17,6 @@ namespace impl {
 
 namespace {
 
-bool IsLetter(char c) { return (c >= 'a' && c <= 'z') || (c >= 'A' && c <= 'Z'); }
-
 bool StartsWithDash(std::string_view word) { return !word.empty() && word[0] == '-'; }
 
 bool LooksLikeOption(std::string_view word) {

@@ -12,8 +12,6 @@ namespace {
 using AutoCli::CommandOption;
 using AutoCli::ValueKind;
 
-bool IsLetter(char c) { return (c >= 'a' && c <= 'z') || (c >= 'A' && c <= 'Z'); }
-
 bool IsLetterOrDigit(char c) { return IsLetter(c) || (c >= '0' && c <= '9'); }
 
 // One option on its way from the document to the description.

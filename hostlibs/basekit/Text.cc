@@ -6,6 +6,8 @@
 
 namespace BaseKit::impl {
 
+bool IsLetter(char c) { return (c >= 'a' && c <= 'z') || (c >= 'A' && c <= 'Z'); }
+
 std::string Shortened(std::string_view text, std::size_t limit) {
     if (text.size() <= limit) {
         return std::string(text);

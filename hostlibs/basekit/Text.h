@@ -6,8 +6,11 @@
 #include <string_view>
 #include <vector>
 
-// How error sentences name words, options and commands.
+// How error sentences name words, options and commands, and what words are made of.
 namespace BaseKit::impl {
+
+// Whether it is a letter of ASCII, whatever the locale.
+bool IsLetter(char c);
 
 // `text`, or when it is longer than `limit` bytes about as many of them, up to the end of a UTF-8
 // character, and "...": a sentence must fit a line of a log.

@@ -198,15 +198,16 @@ const Case executeCases[] = {
 
 class DescriptionMistakesTest : public ::testing::TestWithParam<Case> {};
 
-std::string NameOf(const ::testing::TestParamInfo<Case>& info) { return info.param.name; }
+std::string CaseName(const ::testing::TestParamInfo<Case>& info) { return info.param.name; }
 
 INSTANTIATE_TEST_SUITE_P(Document, DescriptionMistakesTest, ::testing::ValuesIn(documentCases),
-                         NameOf);
+                         CaseName);
 INSTANTIATE_TEST_SUITE_P(Command, DescriptionMistakesTest, ::testing::ValuesIn(commandCases),
-                         NameOf);
-INSTANTIATE_TEST_SUITE_P(Option, DescriptionMistakesTest, ::testing::ValuesIn(optionCases), NameOf);
+                         CaseName);
+INSTANTIATE_TEST_SUITE_P(Option, DescriptionMistakesTest, ::testing::ValuesIn(optionCases),
+                         CaseName);
 INSTANTIATE_TEST_SUITE_P(Execute, DescriptionMistakesTest, ::testing::ValuesIn(executeCases),
-                         NameOf);
+                         CaseName);
 
 TEST_P(DescriptionMistakesTest, AreNamedWithTheirPlaceAndReason) {
     DescriptionFolder folder;

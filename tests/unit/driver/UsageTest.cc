@@ -55,20 +55,20 @@ const std::vector<std::string> expected = {
     "                            be loaded before it can be activated",
 };
 
-std::string UsageText() {
+std::string PrintedUsage() {
     const support::StreamCapture output(std::cout);
     PrintUsage();
     return output.Text();
 }
 
 TEST(UsageTest, Has40Lines) {
-    const std::string text = UsageText();
+    const std::string text = PrintedUsage();
     EXPECT_EQ(expected.size(), 40U);
     EXPECT_EQ(std::count(text.begin(), text.end(), '\n'), 40);
 }
 
 TEST(UsageTest, EachLineIsExactlyAsScriptsKnowIt) {
-    std::istringstream text(UsageText());
+    std::istringstream text(PrintedUsage());
     std::string line;
     for (std::size_t i = 0; i < expected.size(); ++i) {
         ASSERT_TRUE(std::getline(text, line)) << "line " << i + 1;
@@ -77,11 +77,11 @@ TEST(UsageTest, EachLineIsExactlyAsScriptsKnowIt) {
     EXPECT_FALSE(std::getline(text, line));
 }
 
-TEST(UsageTest, TheLastLineIsEnded) { EXPECT_EQ(UsageText().back(), '\n'); }
+TEST(UsageTest, TheLastLineIsEnded) { EXPECT_EQ(PrintedUsage().back(), '\n'); }
 
 TEST(UsageTest, NothingGoesToStandardError) {
     const support::StreamCapture errors(std::cerr);
-    UsageText();
+    PrintedUsage();
     EXPECT_EQ(errors.Text(), "");
 }
 

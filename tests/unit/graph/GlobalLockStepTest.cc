@@ -22,14 +22,14 @@ namespace {
 using support::Faults;
 
 constexpr unsigned trapFlag = 0x100;
-constexpr pthread_t asker = 1;  // of no thread: both are compared only
+constexpr pthread_t askerName = 1;  // of no thread: both are compared only
 constexpr pthread_t next = 2;
 
 int steps = 0;
 int wrongAnswers = 0;
 
 void Ask(int) {
-    Faults().self = asker;
+    Faults().self = askerName;
     ++steps;
     wrongAnswers += GlobalLock::HeldByCurrentThread() ? 1 : 0;
     Faults().self = next;
@@ -38,7 +38,7 @@ void Ask(int) {
 class GlobalLockStepTest : public support::GraphTest {};
 
 TEST_F(GlobalLockStepTest, LastHolderIsNotTheHolderAtAnyInstructionOfTheNextOnesLockAndUnlock) {
-    Faults().self = asker;
+    Faults().self = askerName;
     GlobalLock::Lock();
     EXPECT_TRUE(GlobalLock::HeldByCurrentThread());
     GlobalLock::Unlock();
