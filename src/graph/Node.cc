@@ -156,36 +156,34 @@ std::int32_t Node::HeightLocked() {
 }
 
 // Depth first. While a node is under way its height is that of the highest dependent seen so far,
-// and 0 before there is one; a dependent that is under way itself closes a cycle.
+// and 0 before there is one; a dependent that is under way itself closes a cycle. The way back lies
+// in the nodes: beside them it would be copied again and again while it grows.
 void Node::ComputeHeight() {
-    struct Visit {
-        Node* node;
-        std::size_t next;  // the dependent to look at
-    };
-    std::vector<Visit> path;
     height = 0;
-    Visit visit{this, 0};
-    for (;;) {
-        const Edges& edges = visit.node->dependents;
-        for (; visit.next != edges.size() && edges[visit.next]->height >= 0; ++visit.next) {
-            if (edges[visit.next]->heightKnown) {
-                visit.node->height = std::max(visit.node->height, edges[visit.next]->height);
-            }
+    for (Node* node = this; node != nullptr;) {
+        if (Node* const unknown = node->NextWithoutHeight()) {
+            unknown->height = 0;
+            unknown->heightSeeker = node;
+            node = unknown;
+        } else {
+            ++node->height;
+            node->heightKnown = true;
+            node = node->heightSeeker;
         }
-        if (visit.next != edges.size()) {
-            path.push_back(visit);
-            visit = {edges[visit.next], 0};
-            visit.node->height = 0;
-            continue;
-        }
-        ++visit.node->height;
-        visit.node->heightKnown = true;
-        if (path.empty()) {
-            return;
-        }
-        visit = path.back();
-        path.pop_back();
     }
+}
+
+Node* Node::NextWithoutHeight() {
+    for (; heightsSeen != dependents.size(); ++heightsSeen) {
+        Node* const dependent = dependents[heightsSeen];
+        if (dependent->height < 0) {
+            return dependent;
+        }
+        if (dependent->heightKnown) {
+            height = std::max(height, dependent->height);
+        }
+    }
+    return nullptr;
 }
 
 }  // namespace vantor

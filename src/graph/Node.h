@@ -122,6 +122,7 @@ private:
     Node* NextIdleDependency();
     void QueueIfReady(Executor& executor);
     void ComputeHeight();
+    Node* NextWithoutHeight();
 
     bool heightKnown = false;
     std::int32_t height = -1;
@@ -132,6 +133,10 @@ private:
     // Of a waiting node: so many of its first dependencies are done. While the node is being
     // requested: so many have been requested.
     std::size_t settled = 0;
+    // While its height is being found: the node whose height that is for, and how many of its
+    // dependents have been looked at.
+    Node* heightSeeker = nullptr;
+    std::size_t heightsSeen = 0;
     Node* nextReady = nullptr;
     pthread_cond_t doneCondition;  // broadcast when the node becomes done through Execute()
 };
