@@ -1,8 +1,14 @@
 // The least that loading native plugins costs: dlopen() with the flags of the program, two symbols,
-// one call, in directory order. Usage: bare-loading DIRECTORY EXPECTED
+// one call, in directory order. With "duties" it also does for each what a boot owes to the host
+// beside loading: sees whether the file is there and whole, looks for the debug configuration and
+// tells the system log what is executed. Usage: bare-loading DIRECTORY EXPECTED [duties]
 
 #include <dirent.h>
 #include <dlfcn.h>
+#include <fcntl.h>
+#include <sys/stat.h>
+#include <syslog.h>
+#include <unistd.h>
 #include <vantor/plugin.h>
 
 #include <cstdlib>
@@ -11,6 +17,26 @@
 #include <string>
 
 namespace {
+
+// Opened twice: the first time without an effect on whatever lies there.
+bool IsWhole(const std::string& path) {
+    char headers[1024];
+    struct stat status {};
+    const int location = open(path.c_str(), O_PATH | O_CLOEXEC);
+    const bool isFile = fstat(location, &status) == 0 && S_ISREG(status.st_mode);
+    const int file = open(path.c_str(), O_RDONLY | O_CLOEXEC);
+    const bool isRead = pread(file, headers, sizeof headers, 0) > 0;
+    close(file);
+    close(location);
+    return isFile && isRead;
+}
+
+void LookForDebugConfiguration() {
+    const int file = open("/etc/nuvex/vantor/debug.conf", O_RDONLY);
+    if (file >= 0) {
+        close(file);
+    }
+}
 
 bool LoadAndStart(const std::string& path) {
     void* const handle = dlopen(path.c_str(), RTLD_LAZY | RTLD_GLOBAL);
@@ -26,17 +52,27 @@ bool LoadAndStart(const std::string& path) {
 }  // namespace
 
 int main(int argc, char** argv) {
-    DIR* const folder = argc == 3 ? opendir(argv[1]) : nullptr;
+    const bool duties = argc == 4 && std::strcmp(argv[3], "duties") == 0;
+    DIR* const folder = argc == 3 || duties ? opendir(argv[1]) : nullptr;
     if (folder == nullptr) {
-        std::cerr << "usage: bare-loading DIRECTORY EXPECTED" << std::endl;
+        std::cerr << "usage: bare-loading DIRECTORY EXPECTED [duties]" << std::endl;
         return EXIT_FAILURE;
     }
     int loaded = 0;
     const std::string prefix = std::string(argv[1]) + '/';
     while (const dirent* const entry = readdir(folder)) {
-        if (entry->d_name[0] != '.' && LoadAndStart(prefix + entry->d_name)) {
-            ++loaded;
+        if (entry->d_name[0] == '.') {
+            continue;
         }
+        const std::string path = prefix + entry->d_name;
+        if (duties) {
+            LookForDebugConfiguration();
+            if (!IsWhole(path)) {
+                continue;
+            }
+            syslog(LOG_INFO, "executing start plugin: %s", entry->d_name);
+        }
+        loaded += LoadAndStart(path) ? 1 : 0;
     }
     closedir(folder);
     return loaded == std::atoi(argv[2]) ? EXIT_SUCCESS : EXIT_FAILURE;

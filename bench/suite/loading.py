@@ -34,19 +34,25 @@ def _boot(host, count):
 
 def measure(host, results):
     counts = [50, 100] if results.quick else [100, 1000, 5000]
-    series = {"vantor": [], "bare dlopen loop": []}
+    loop, duties = "bare dlopen loop", "the loop with the log and the checks"
+    series = {"vantor": [], loop: [], duties: []}
     for count in counts:
         lay_out_plugins(host, count)
         figures = results.alternate(f"loading: {count:,} native plugins", {
             "vantor": lambda count=count: _boot(host, count),
-            "bare": lambda count=count:
-                host.median("/usr/bin/bare-loading", PLUGINS, str(count)) / 1000 / count})
+            loop: lambda count=count:
+                host.median("/usr/bin/bare-loading", PLUGINS, str(count)) / 1000 / count,
+            duties: lambda count=count:
+                host.median("/usr/bin/bare-loading", PLUGINS, str(count), "duties")
+                / 1000 / count})
         # A process of its own costs more than a hundred plugins: only the others say what one does.
         limit = 1.1 if count >= 1000 else None
         results.compare("loading", f"{count:,} native plugins, loaded and run", "us/plugin",
-                        ("vantor", figures["vantor"]), ("bare dlopen loop", figures["bare"]), limit)
-        series["vantor"].append((count, statistics.median(figures["vantor"])))
-        series["bare dlopen loop"].append((count, statistics.median(figures["bare"])))
+                        ("vantor", figures["vantor"]), (loop, figures[loop]), limit)
+        results.compare("loading", f"{count:,} native plugins, loaded and run", "us/plugin",
+                        ("vantor", figures["vantor"]), (duties, figures[duties]), None)
+        for program, points in series.items():
+            points.append((count, statistics.median(figures[program])))
     host.clear_plugins()
     results.curves.append(Curve("loading", "Native plugins, loaded and run", "plugins",
                                 "us a plugin", series))
