@@ -44,14 +44,14 @@ function(vantor_install_documents component)
     endif()
 endfunction()
 
-# vantor: the program and all that the host boots it with.
-install(TARGETS vantor RUNTIME DESTINATION sbin COMPONENT vantor)
+# vantor: the program, the one that looks at its boots, and all that the host boots it with.
+install(TARGETS vantor vantor-analyze RUNTIME DESTINATION sbin COMPONENT vantor)
 install(DIRECTORY DESTINATION libexec/vantor/plugins COMPONENT vantor)
 install(PROGRAMS ${vantorPackaging}/vantor.init DESTINATION /etc/init.d
     RENAME vantor COMPONENT vantor)
 install(FILES ${vantorPackaging}/vantor.default DESTINATION /etc/default
     RENAME vantor COMPONENT vantor)
-install(FILES ${vantorPackaging}/completion/vantor
+install(FILES ${vantorPackaging}/completion/vantor ${vantorPackaging}/completion/vantor-analyze
     DESTINATION share/bash-completion/completions COMPONENT vantor)
 vantor_install_documents(vantor)
 

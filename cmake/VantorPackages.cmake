@@ -42,13 +42,17 @@ set(CPACK_DEBIAN_VANTOR_PACKAGE_DEPENDS "vantor-hostlibs | vantor-host-libraries
 set(CPACK_DEBIAN_VANTOR_PACKAGE_CONTROL_EXTRA
     ${vantorControl}/vantor/conffiles
     ${vantorControl}/vantor/postinst
-    ${vantorControl}/vantor/postrm)
+    ${vantorControl}/vantor/postrm
+    ${vantorControl}/vantor/triggers)
 set(CPACK_COMPONENT_VANTOR_DESCRIPTION "boot-time service orchestrator of a server host
 vantor finds the host's plugins at boot, works out from what each one provides
 and requires which must wait for which, and runs them all, one after the other
 or eight at a time. A plugin is a shared object, a document of management
 commands, or a shell command put in for debugging. One that fails is reported
 and never stops the boot; afterwards a log says what ran when.
+
+The tool vantor-analyze checks plugins before a boot, and draws and compares
+what boots took their time for.
 
 The host boots with the init script of this package.")
 

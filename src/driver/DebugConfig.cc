@@ -87,14 +87,14 @@ std::vector<std::string> SplitFields(const std::string& line) {
 }
 
 // Appends the entry that `line` holds and returns true, or returns false for a malformed line.
-bool ParseEntry(const std::string& line, std::list<DebugEntry>& entries) {
+bool ParseEntry(const std::string& line, int lineNumber, std::list<DebugEntry>& entries) {
     std::vector<std::string> fields = SplitFields(line);
     if (fields.size() != 4) {
         return false;
     }
     try {
         entries.push_back({std::move(fields[0]), SplitEscapedList(Trim(fields[1])),
-                           SplitEscapedList(Trim(fields[2])), std::move(fields[3])});
+                           SplitEscapedList(Trim(fields[2])), std::move(fields[3]), lineNumber});
     } catch (const std::runtime_error&) {
         return false;
     }
@@ -109,13 +109,18 @@ std::list<DebugEntry> ReadDebugConfig() {
 }
 
 std::list<DebugEntry> ParseDebugConfig(std::istream& stream) {
+    return ParseDebugConfig(
+        stream, [](int, const std::string& text) { syslog(LOG_INFO, "%s", text.c_str()); });
+}
+
+std::list<DebugEntry> ParseDebugConfig(std::istream& stream, const MalformedLineReport& report) {
     std::list<DebugEntry> entries;
     std::string rawLine;
     for (int lineNumber = 1; std::getline(stream, rawLine); ++lineNumber) {
         const std::string line = Trim(rawLine);
-        if (!line.empty() && !ParseEntry(line, entries)) {
-            syslog(LOG_INFO, "ignoring malformed debug entry at line %d: %s", lineNumber,
-                   line.c_str());
+        if (!line.empty() && !ParseEntry(line, lineNumber, entries)) {
+            report(lineNumber, "ignoring malformed debug entry at line " +
+                                   std::to_string(lineNumber) + ": " + line);
         }
     }
     return entries;

@@ -4,10 +4,11 @@
 #include <list>
 #include <string>
 
-#include "json/JsonValue.h"
 #include "plugins/Plugin.h"
 
 namespace vantor {
+
+struct PluginDocument;
 
 // A plugin made from a JSON document: command lines of the host's management tool for each of its
 // two methods. A command that fails is logged and keeps neither the next one from running nor the
@@ -34,8 +35,7 @@ public:
     }
 
 private:
-    void ReadMetadata(JsonValue& metadata, const std::string& path);
-    void ReadOperations(JsonValue& operations, const std::string& path);
+    void Link(const PluginDocument& document);
 
     std::list<std::string> startCommands;
     std::list<std::string> applyHostProfileCommands;  // empty below version 2

@@ -14,11 +14,7 @@ bool IsFilteredOut(const Plugin& plugin, const std::set<std::string>& bootFlags,
                    const std::list<std::string>& blacklist);
 
 // Whether the plugin is a run-once plugin whose very version is in the record; if so, says it in
-// syslog. A run-once plugin that is not in the record is added to it.
-//
-// The record holds the key (name and version, nothing between) without the characters that a boot
-// option cannot carry, but is asked for the key as it is: a plugin whose name or version has such
-// characters is never taken for one that has run.
+// syslog. A run-once plugin that is not in the record is added to it (plugins/FilterRules.h).
 bool HasAlreadyRun(const Plugin& plugin, std::set<std::string>& runOnceRecord);
 
 }  // namespace vantor

@@ -20,7 +20,8 @@ UNSAID = {
 }
 # The functions that hand a whole text on to syslog, with the place of the text in their arguments,
 # by what the call of syslog names.
-HANDED_ON = {"complaint": ("Check", 1), "message.c_str()": ("ReportFailure", 0)}
+HANDED_ON = {"complaint": ("Check", 1), "message.c_str()": ("ReportFailure", 0),
+             "text.c_str()": ("report", 1), "verdict.message.c_str()": ("KeepOut", 1)}
 
 
 def pattern(pieces):
@@ -73,6 +74,12 @@ def log_messages():
 
 def handed_on(source, priority, function):
     name, place = function
+    if priority == "verdict.priority":  # stands beside the text
+        found = [(cxx_texts.spelling(call[0]), cxx_texts.text_of(call[place]))
+                 for caller in SOURCES for call in caller.calls(name)
+                 if any(item.kind == "string" for item in call[place])]
+        assert found, f"nobody calls {name} with a text"
+        return found
     if priority == "priority":  # LogFormat's own: told by whoever calls it
         callers = [other for other in SOURCES if list(other.calls("LogFormat"))]
         priorities = {cxx_texts.spelling(call[0]) for other in callers
@@ -107,7 +114,7 @@ def test_every_log_message_is_explained_with_its_priority():
 
 def test_no_priority_is_used_past_the_messages_that_are_known():
     used = [word for source in SOURCES for word in source.words(r"LOG_[A-Z]+")]
-    calls = [call for source in SOURCES for call in source.calls("syslog", "LogFormat")]
+    calls = [call for source in SOURCES for call in source.calls("syslog", "LogFormat", "KeepOut")]
     named = [cxx_texts.spelling(call[0]) for call in calls]
     assert len(used) >= 30
     assert sorted(used) == sorted(name for name in named if name.startswith("LOG_"))
@@ -119,9 +126,9 @@ def test_no_priority_is_used_past_the_messages_that_are_known():
     ("AppendCommands", ["operations is corrupt (unable to parse {})"]),
 ])
 def test_every_rejection_of_a_document_stands_whole_on_its_page(call, texts_of_key):
-    keys = [cxx_texts.text_of(arguments[1])[0] for source in SOURCES
-            for arguments in source.calls(call)
-            if len(arguments) > 2 and cxx_texts.is_literal(arguments[1])]
+    named = [[argument for argument in arguments[1:] if cxx_texts.is_literal(argument)]
+             for source in SOURCES for arguments in source.calls(call)]
+    keys = [cxx_texts.text_of(literals[-1])[0] for literals in named if literals]
     assert len(keys) == 2
     page = pages.plain("vantor-json.5")
     for key in keys:
@@ -131,7 +138,7 @@ def test_every_rejection_of_a_document_stands_whole_on_its_page(call, texts_of_k
 
 def test_every_reason_against_a_plugin_file_is_on_the_page_of_its_kind():
     kinds = {"NativePlugin.cc": "vantor-plugin.5", "SharedObjectCheck.cc": "vantor-plugin.5",
-             "JSONPlugin.cc": "vantor-json.5"}
+             "JSONPlugin.cc": "vantor-json.5", "PluginDocument.cc": "vantor-json.5"}
     count = 0
     for source in SOURCES:
         page = kinds.get(os.path.basename(source.name))

@@ -42,6 +42,35 @@ Options:
 Described in examples/json/commands/network.json
 """
 
+# As vantor-analyze lists its verbs, and the options of one of them.
+VERBS = """\
+Shows what a boot will do before it runs, and where its time went afterwards.
+Usage: vantor-analyze [OPTIONS] SUBCOMMAND
+
+Options:
+  -h,--help                   Print this help message and exit
+  --version                   Print the version and exit
+
+Subcommands:
+  verify                      Tell all that is wrong with a plugin directory
+  explain                     Tell in words what a plugin waits for
+  blame                       Show what each plugin waited for
+"""
+VERB = """\
+Tell all that is wrong with a plugin directory
+Usage: vantor-analyze verify [OPTIONS] [DIRECTORY]
+
+Positionals:
+  DIRECTORY                   The plugin directory, a host's path
+
+Options:
+  -h,--help                   Print this help message and exit
+  --root FOLDER               Read the host whose file system lies in FOLDER
+  --format FORMAT:{text,json,sarif} [text]
+                              text, json or sarif
+  --strict                    Make every warning an error
+"""
+
 
 class Bash:
     """An interactive bash. Instead of running a command line, its programs show their words."""
@@ -60,7 +89,7 @@ class Bash:
         self.say("bind 'set completion-query-items 0' 'set colored-stats off'")
         for setting in settings:
             self.say(setting)
-        for name in ("vantor", "nvcli"):
+        for name in ("vantor", "nvcli", "vantor-analyze"):
             self.say(f". '{source}/packaging/completion/{name}'")
 
     def say(self, line):
@@ -94,7 +123,7 @@ class Bash:
 
 @pytest.fixture(name="folder", scope="module")
 def fixture_folder(tmp_path_factory):
-    """A folder with plugins, folders and stand-ins for the two programs."""
+    """A folder with plugins, folders and stand-ins for the programs."""
     tmp_path = tmp_path_factory.mktemp("completion")
     for name in ("libstorage.so", "libstart net.so", "setup.json", "probe.debug", "README"):
         (tmp_path / "plugins").mkdir(exist_ok=True)
@@ -105,6 +134,15 @@ def fixture_folder(tmp_path_factory):
     (tmp_path / "bin" / "vantor").write_text(show)
     (tmp_path / "page").write_text(PAGE)
     (tmp_path / "command").write_text(COMMAND)
+    (tmp_path / "verbs").write_text(VERBS)
+    (tmp_path / "verb").write_text(VERB)
+    (tmp_path / "bin" / "vantor-analyze").write_text(f"""#!/bin/sh
+case "$*" in
+--help) cat {tmp_path}/verbs ;;
+*--help) cat {tmp_path}/verb ;;
+*) printf words; printf '<%s>' "$@" ;;
+esac
+""")
     (tmp_path / "bin" / "nvcli").write_text(f"""#!/bin/sh
 echo "$@" >> {tmp_path}/asked
 case "$*" in
@@ -114,7 +152,7 @@ case "$*" in
 *) printf words; printf '<%s>' "$@" ;;
 esac
 """)
-    for name in ("vantor", "nvcli"):
+    for name in ("vantor", "nvcli", "vantor-analyze"):
         (tmp_path / "bin" / name).chmod(0o755)
     return str(tmp_path)
 
@@ -221,3 +259,28 @@ def test_all_that_a_namespace_holds_is_offered(bash):
     assert {"load", "list"} <= bash.offers("nvcli network route l")
     assert {"network", "system", "reboot", "--help"} <= bash.offers("nvcli ")
 
+
+
+@pytest.mark.parametrize("line, words", [
+    ("vantor-analyze ver", ["verify"]),
+    ("vantor-analyze --ver", ["--version"]),
+    ("vantor-analyze verify --st", ["verify", "--strict"]),
+    ("vantor-analyze verify --ro", ["verify", "--root="]),
+    ("vantor-analyze verify --root=pic", ["verify", "--root=pictures/"]),
+    ("vantor-analyze verify --format=js", ["verify", "--format=json"]),
+    ("vantor-analyze verify --format sa", ["verify", "--format", "sarif"]),
+    ("vantor-analyze verify pic", ["verify", "pictures/"]),
+    ("vantor-analyze blame comm", ["blame", "command"]),
+    ("vantor-analyze blame --output=comm", ["blame", "--output=command"]),
+    ("vantor-analyze explain --directory=plugins set",
+     ["explain", "--directory=plugins", "setup"]),
+    ("vantor-analyze graph --directory plugins --around sto",
+     ["graph", "--directory", "plugins", "--around", "storage"]),
+])
+def test_verbs_and_their_options_are_those_that_the_program_lists(bash, line, words):
+    assert bash.words(line) == words
+
+
+def test_all_verbs_and_options_are_offered(bash):
+    assert {"verify", "explain", "blame"} <= bash.offers("vantor-analyze ")
+    assert {"--help", "--root=", "--format=", "--strict"} <= bash.offers("vantor-analyze verify -")

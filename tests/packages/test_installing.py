@@ -78,6 +78,36 @@ def test_an_upgrade_renews_settings_that_nobody_changed(host, packages, tmp_path
     assert host.read("/etc/default/vantor").endswith("# a word more\n")
 
 
+PLUGIN = '''{"metadata": {"version": 1, "requires": ["storag"], "provides": []},
+"operations": {"start": []}}'''
+FOUND = "vantor: vantor-analyze verify finds in the plugin directory:"
+
+
+def test_installing_a_plugin_tells_what_is_wrong_with_it(host, tmp_path):
+    plugin = make_deb(tmp_path, "a-plugin", {"/usr/libexec/vantor/plugins/vault.json": PLUGIN})
+    done = host.dpkg_install(plugin)
+    assert done.returncode == 0, done.stdout + done.stderr
+    found = done.stdout.partition(FOUND + "\n")[2]
+    assert "/usr/libexec/vantor/plugins/vault.json" in found and "error[no-provider]: " in found
+    assert host.state_of("a-plugin") == host.state_of("vantor") == "installed"
+
+
+def test_removing_the_plugin_at_fault_leaves_nothing_to_tell(host, tmp_path):
+    plugin = make_deb(tmp_path, "a-plugin", {"/usr/libexec/vantor/plugins/vault.json": PLUGIN})
+    host.dpkg_install(plugin)
+    assert FOUND not in host.run("dpkg", "--remove", "a-plugin")
+    assert host.state_of("vantor") == "installed"
+
+
+def test_a_check_that_cannot_be_run_stops_no_installation(host, tmp_path):
+    host.script("/usr/sbin/vantor-analyze", "echo broken; exit 127")
+    plugin = make_deb(tmp_path, "a-plugin", {"/usr/libexec/vantor/plugins/vault.json": PLUGIN})
+    done = host.dpkg_install(plugin)
+    assert done.returncode == 0, done.stdout + done.stderr
+    assert FOUND + "\nbroken\n" in done.stdout
+    assert host.state_of("a-plugin") == host.state_of("vantor") == "installed"
+
+
 def test_removing_leaves_settings_and_nothing_that_runs(host):
     lay_out_host(host)
     boot(host)

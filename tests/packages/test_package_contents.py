@@ -26,7 +26,9 @@ def test_vantor_holds_the_program_and_what_boots_it(packages):
         "/etc/default/vantor",
         "/etc/init.d/vantor",
         "/usr/sbin/vantor",
+        "/usr/sbin/vantor-analyze",
         "/usr/share/bash-completion/completions/vantor",
+        "/usr/share/bash-completion/completions/vantor-analyze",
         "/usr/share/lintian/overrides/vantor",
     }
     assert packages["vantor"].contents()["/usr/libexec/vantor/plugins/"] == "drwxr-xr-x root/root"
@@ -62,7 +64,8 @@ def test_the_developers_package_holds_what_a_plugin_is_built_with(packages, sour
 
 
 @pytest.mark.parametrize("name, page", [
-    ("vantor", "man8/vantor.8"), ("vantor-hostlibs", "man1/nvcli.1"),
+    ("vantor", "man8/vantor.8"), ("vantor", "man8/vantor-analyze.8"),
+    ("vantor-hostlibs", "man1/nvcli.1"),
 ])
 def test_each_program_has_a_manual_page(packages, name, page):
     assert f"/usr/share/man/{page}.gz" in packages[name].files()
@@ -70,7 +73,9 @@ def test_each_program_has_a_manual_page(packages, name, page):
 
 @pytest.mark.parametrize("name", ["vantor", "vantor-hostlibs", "vantor-dev"])
 def test_only_what_is_run_can_be_executed(packages, name):
-    programs = {"/usr/sbin/vantor", "/usr/bin/nvcli", "/etc/init.d/vantor"}
+    programs = {
+        "/usr/sbin/vantor", "/usr/sbin/vantor-analyze", "/usr/bin/nvcli", "/etc/init.d/vantor",
+    }
     for file, described in packages[name].contents().items():
         mode = "drwxr-xr-x" if file.endswith("/") else "-rw-r--r--"
         if file in programs:
@@ -81,6 +86,12 @@ def test_only_what_is_run_can_be_executed(packages, name):
 def test_settings_are_the_administrators(packages):
     lines = packages["vantor"].control_file("conffiles").split()
     assert lines == ["/etc/default/vantor", "/etc/init.d/vantor"]
+
+
+def test_the_plugin_directory_is_watched(packages):
+    lines = packages["vantor"].control_file("triggers").splitlines()
+    assert [line for line in lines if not line.startswith("#")] == [
+        "interest-noawait /usr/libexec/vantor/plugins"]
 
 
 def test_a_hosts_own_libraries_serve_as_well_as_ours(packages):

@@ -62,9 +62,13 @@ class Deb:
         return Deb(made)
 
 
-def make_deb(folder, name, **fields):
-    """A package without files, with these fields of its control file."""
+def make_deb(folder, name, files=(), **fields):
+    """A package of these files, {name: content}, with these fields of its control file."""
     tree = os.path.join(folder, name)
+    for file, content in dict(files).items():
+        os.makedirs(os.path.dirname(tree + file), exist_ok=True)
+        with open(tree + file, "w", encoding="utf-8") as opened:
+            opened.write(content)
     os.makedirs(os.path.join(tree, "DEBIAN"))
     described = {
         "Package": name, "Version": "1", "Architecture": "all",

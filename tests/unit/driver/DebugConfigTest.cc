@@ -58,6 +58,25 @@ protected:
     support::SyslogCapture log;
 };
 
+TEST_F(DebugConfigTest, EntriesKnowTheirLines) {
+    const std::list<DebugEntry> entries = Parse("\na:b:c:d\nmalformed\n \ne:f:g:h");
+    EXPECT_THAT(entries, ElementsAre(Field("line", &DebugEntry::line, 2),
+                                     Field("line", &DebugEntry::line, 5)));
+}
+
+TEST_F(DebugConfigTest, MalformedLinesAreGivenToWhoAsksForThemInPlaceOfTheLog) {
+    std::vector<std::pair<int, std::string>> reported;
+    std::istringstream stream("a:b:c:d\n x:y \n");
+    const std::list<DebugEntry> entries =
+        ParseDebugConfig(stream, [&reported](int line, const std::string& text) {
+            reported.emplace_back(line, text);
+        });
+    EXPECT_THAT(entries, SizeIs(1));
+    EXPECT_THAT(reported, ElementsAre(std::pair<int, std::string>(
+                              2, "ignoring malformed debug entry at line 2: x:y")));
+    EXPECT_THAT(log.Entries(), IsEmpty());
+}
+
 TEST_F(DebugConfigTest, ALineIsAnEntryOfFourFields) {
     EXPECT_THAT(Parse("x:a,b:c:d\n"), ElementsAre(Entry("x", {"a", "b"}, {"c"}, "d")));
     EXPECT_THAT(log.Entries(), IsEmpty());

@@ -1,0 +1,81 @@
+#ifndef VANTOR_ANALYZE_IMAGE_SHAREDOBJECT_H
+#define VANTOR_ANALYZE_IMAGE_SHAREDOBJECT_H
+
+#include <cstdint>
+#include <optional>
+#include <string>
+#include <string_view>
+#include <vector>
+
+#include "image/ElfFile.h"
+
+namespace vantor::analyze {
+
+// What a pointer in an object's data will be once the object has been loaded.
+struct LoadedPointer {
+    enum class Kind {
+        Null,
+        Inside,   // the object itself, at `address`
+        Outside,  // another object, which the file does not name
+    };
+
+    Kind kind = Kind::Null;
+    std::uint64_t address = 0;
+    // The exported symbol that the linker looks up for it, in all loaded objects; empty when it
+    // looks up none, or only in this object.
+    std::string_view symbol;
+};
+
+// The exported symbols of a shared object and its data with the dynamic relocations applied, of
+// those that can occur in data: x86-64, i386, AArch64 and ARM. Takes time in proportion to the
+// size of the file, and a logarithm for each pointer that is read.
+class SharedObject {
+public:
+    // The file outlives this object. Throws ElfError for tables that lie outside of it.
+    explicit SharedObject(const ElfFile& elfFile);
+
+    struct Symbol {
+        std::string_view name;
+        std::uint64_t address;
+        std::uint64_t size;  // 0: the object does not say
+    };
+
+    // What dlsym(3) finds in the object, in the order of its table.
+    const std::vector<Symbol>& Exports() const { return exports; }
+    const Symbol* Find(std::string_view name) const;
+
+    // Empty where none is loaded, or where a relocation stands that is not known.
+    std::optional<LoadedPointer> Pointer(std::uint64_t address) const;
+
+    const ElfFile& File() const { return file; }
+
+private:
+    enum class Meaning { None, Relative, Absolute, AbsoluteWithoutAddend, Computed, Unknown };
+    struct Relocation {
+        std::uint64_t address;
+        std::uint32_t type;
+        std::uint32_t symbol;
+        std::int64_t addend;
+        bool hasAddend;  // else it stands in the place itself
+    };
+
+    void ReadSymbols();
+    std::uint64_t CountSymbols() const;
+    std::uint64_t CountHashedSymbols(std::uint64_t hash) const;
+    void AddExport(const GElf_Sym& symbol);
+    std::string_view Name(const GElf_Sym& symbol) const;
+    void ReadRelocations(std::int64_t tableTag, std::int64_t sizeTag, bool withAddends);
+    static Meaning MeaningOf(std::uint16_t machine, std::uint32_t type);
+    std::optional<LoadedPointer> ToSymbol(const Relocation& relocation, std::uint64_t addend) const;
+    std::uint64_t Wrapped(std::uint64_t address) const;
+
+    const ElfFile& file;
+    std::string_view names;
+    bool looksInItselfFirst = false;
+    std::vector<Symbol> exports;
+    std::vector<Relocation> relocations;  // by address
+};
+
+}  // namespace vantor::analyze
+
+#endif

@@ -1,0 +1,248 @@
+// Debug entries, commands and the ownership of files: what else a host's folders tell.
+
+#include <fcntl.h>
+#include <gmock/gmock.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include "analyze/image/HostFixture.h"
+#include "image/CommandDescriptions.h"
+#include "image/DebugDescription.h"
+#include "image/ImageFile.h"
+#include "image/Ownership.h"
+#include "image/SharedNames.h"
+
+namespace vantor::analyze {
+
+namespace {
+
+using ::testing::ElementsAre;
+using ::testing::IsEmpty;
+
+class DebugDescriptionTest : public support::HostFixture {};
+
+TEST_F(DebugDescriptionTest, EveryEntryIsAPluginOfItsLine) {
+    Write(HostImage::debugConfiguration, "\nlook:a,b:c:cat /x\n\nlast:z: :true\n");
+    const std::vector<PluginDescription> plugins =
+        DebugDescription(image, findings).OfConfiguration(findings);
+    EXPECT_THAT(Found(), IsEmpty());
+    ASSERT_EQ(plugins.size(), 2U);
+    EXPECT_EQ(plugins[0].name, "look");
+    EXPECT_EQ(plugins[0].kind, PluginKind::Debug);
+    EXPECT_EQ(plugins[0].apiVersion, 1);
+    EXPECT_EQ(plugins[0].place.path, "/etc/nuvex/vantor/debug.conf");
+    EXPECT_EQ(plugins[0].place.line, 2);
+    ASSERT_EQ(plugins[0].required.size(), 2U);
+    EXPECT_EQ(plugins[0].required[1].name, "b");
+    EXPECT_EQ(plugins[0].required[1].place.line, 2);
+    EXPECT_EQ(plugins[0].provided.at(0).name, "c");
+    EXPECT_EQ(plugins[1].place.line, 4);
+}
+
+TEST_F(DebugDescriptionTest, AMalformedEntryIsToldInTheBootsWords) {
+    Write(HostImage::debugConfiguration, "a:b:c:d\n  x:a:b \n");
+    EXPECT_EQ(DebugDescription(image, findings).OfConfiguration(findings).size(), 1U);
+    EXPECT_THAT(Found(), ElementsAre("/etc/nuvex/vantor/debug.conf:2 warning malformed-entry: "
+                                     "ignoring malformed debug entry at line 2: x:a:b"));
+}
+
+TEST_F(DebugDescriptionTest, WithoutAConfigurationThereAreNone) {
+    EXPECT_THAT(DebugDescription(image, findings).OfConfiguration(findings), IsEmpty());
+    EXPECT_THAT(Found(), IsEmpty());
+}
+
+TEST_F(DebugDescriptionTest, AMarkerWithoutAnEntryIsTold) {
+    DebugDescription debug(image, findings);
+    EXPECT_THAT(debug.OfMarker("x", {"/p/x.debug", 0, 0}, findings), IsEmpty());
+    EXPECT_THAT(Found(), ElementsAre("/p/x.debug:0 warning marker-without-entry: no entry of "
+                                     "/etc/nuvex/vantor/debug.conf has the name \"x\""));
+}
+
+TEST_F(DebugDescriptionTest, AnEntryThatAMarkerBringsTooRunsTwice) {
+    Write(HostImage::debugConfiguration, "x:a:b:c\ny:a:b:c\nx:d:e:f\n");
+    DebugDescription debug(image, findings);
+    const auto marked = debug.OfMarker("x", {"/p/x.debug", 0, 0}, findings);
+    ASSERT_EQ(marked.size(), 2U);
+    EXPECT_EQ(marked[1].place.line, 3);
+    debug.OfMarker("y", {"/p/liby.debug", 0, 0}, findings);
+    debug.OfMarker("y", {"/p/y.debug", 0, 0}, findings);
+    EXPECT_EQ(debug.OfConfiguration(findings).size(), 3U);
+    EXPECT_THAT(Found(),
+                ElementsAre("/etc/nuvex/vantor/debug.conf:1 warning entry-twice: the entry \"x\" "
+                            "runs twice: for itself and for the marker /p/x.debug",
+                            "/etc/nuvex/vantor/debug.conf:2 warning entry-twice: the entry \"y\" "
+                            "runs 3 times: for itself and for the marker /p/liby.debug, /p/y.debug",
+                            "/etc/nuvex/vantor/debug.conf:3 warning entry-twice: the entry \"x\" "
+                            "runs twice: for itself and for the marker /p/x.debug"));
+}
+
+class CommandDescriptionsTest : public support::HostFixture {
+protected:
+    void Describe() const {
+        Write("/usr/lib/nuvex/nvcli/int/ext/system.json",
+              R"({"commands": [{"path": "system folder create", "summary": "s",
+                  "options": [{"name": "path", "kind": "string", "required": true,
+                               "summary": "s"}],
+                  "execute": ["/bin/mkdir", "${path}"]}]})");
+    }
+    std::vector<std::string> Check(const std::string& text) {
+        CommandDescriptions(image, findings).Check({text, {"/p/x.json", 3, 5}}, findings);
+        return Found();
+    }
+};
+
+TEST_F(CommandDescriptionsTest, AKnownCommandPasses) {
+    Describe();
+    EXPECT_THAT(Check("system folder create --path='/a b'"), IsEmpty());
+    EXPECT_THAT(Check("system folder --help"), IsEmpty());
+    EXPECT_THAT(Check(""), IsEmpty());
+}
+
+TEST_F(CommandDescriptionsTest, AnUnknownCommandIsToldInTheBootsWords) {
+    Describe();
+    EXPECT_THAT(Check("system folder creat --path=/a"),
+                ElementsAre("/p/x.json:3 warning unknown-command: \"system folder creat "
+                            "--path=/a\": unknown command \"system folder creat\"; the nearest "
+                            "known one is \"system folder create\""));
+}
+
+TEST_F(CommandDescriptionsTest, ACommandWithBadOptionsIsTold) {
+    Describe();
+    EXPECT_THAT(Check("system folder create"),
+                ElementsAre("/p/x.json:3 warning bad-command: \"system folder create\": the "
+                            "command \"system folder create\" needs the option \"--path\""));
+}
+
+TEST_F(CommandDescriptionsTest, ACommandLineThatCannotBeParsedIsTold) {
+    Describe();
+    const std::vector<std::string> found = Check("system 'open");
+    ASSERT_EQ(found.size(), 1U);
+    EXPECT_EQ(found[0].rfind("/p/x.json:3 warning bad-command: \"system 'open\": ", 0), 0U);
+}
+
+TEST_F(CommandDescriptionsTest, WithoutDescriptionsNobodyKnowsBetter) {
+    EXPECT_THAT(Check("system folder creat"), IsEmpty());
+}
+
+TEST_F(CommandDescriptionsTest, ABadDescriptionIsToldByItsPathOnTheHost) {
+    Write("/usr/lib/nuvex/nvcli/x.json", "{}");
+    CommandDescriptions(image, findings).Check({"", {}}, findings);
+    const std::vector<std::string> found = Found();
+    ASSERT_EQ(found.size(), 1U);
+    EXPECT_EQ(found[0].rfind("/usr/lib/nuvex/nvcli:0 warning bad-description: "
+                             "/usr/lib/nuvex/nvcli/x.json: ",
+                             0),
+              0U)
+        << found[0];
+}
+
+class OwnershipTest : public support::HostFixture {
+protected:
+    std::vector<std::string> Check(mode_t mode, uid_t owner) {
+        struct stat status {};
+        status.st_mode = mode;
+        status.st_uid = owner;
+        status.st_gid = 7;
+        Ownership(image).Check("/x", status, findings);
+        return Found();
+    }
+};
+
+TEST_F(OwnershipTest, WhatRootAloneMayWriteIsGood) { EXPECT_THAT(Check(0100755, 0), IsEmpty()); }
+
+TEST_F(OwnershipTest, TheOwnerOfTheImageStandsForRoot) {
+    EXPECT_THAT(Check(0100644, geteuid()), IsEmpty());
+}
+
+TEST_F(OwnershipTest, EveryoneElseWhoMayWriteIsNamed) {
+    EXPECT_THAT(Check(0100666, 4711),
+                ElementsAre("/x:0 warning writable: can be written by others than root: its "
+                            "owner, user 4711, its group, 7, everybody (mode 0666)"));
+}
+
+TEST_F(OwnershipTest, FoldersAboveAreLookedAtOnceAndStickyOnesAreGoodEnough) {
+    Write("/a/b/c/x", "");
+    chmod(folder.Path().c_str(), 0755);
+    chmod(folder.File("a").c_str(), 0777);
+    chmod(folder.File("a/b").c_str(), 01777);
+    chmod(folder.File("a/b/c").c_str(), 01777);
+    Ownership ownership(image);
+    ownership.CheckFoldersOf("/a/b/c/x", findings);
+    ownership.CheckFoldersOf("/a/b/c/y", findings);
+    EXPECT_THAT(Found(), ElementsAre("/a/b/c:0 warning writable: can be written by others than "
+                                     "root: its group, " +
+                                         std::to_string(getegid()) + ", everybody (mode 1777)",
+                                     "/a:0 warning writable: can be written by others than root: "
+                                     "its group, " +
+                                         std::to_string(getegid()) + ", everybody (mode 0777)"));
+}
+
+class ImageFileTest : public support::HostFixture {};
+
+TEST_F(ImageFileTest, AbsoluteLinksStayInTheImage) {
+    Write("/opt/x", "inside");
+    ASSERT_EQ(symlink("/opt/x", folder.File("link").c_str()), 0);
+    struct stat own {};
+    ASSERT_NE(stat("/opt/x", &own), 0) << "this machine must not have the file";
+    const ImageFile file = ReadImageFile(image, "/link");
+    EXPECT_EQ(file.kind, ImageFile::Kind::Regular);
+    EXPECT_EQ(file.content, "inside");
+}
+
+TEST_F(ImageFileTest, KindsAreTold) {
+    ASSERT_EQ(mkfifo(folder.File("fifo").c_str(), 0600), 0);
+    ASSERT_EQ(mkdir(folder.File("folder").c_str(), 0700), 0);
+    EXPECT_EQ(ReadImageFile(image, "/fifo").kind, ImageFile::Kind::Irregular);
+    EXPECT_EQ(ReadImageFile(image, "/folder").kind, ImageFile::Kind::Folder);
+    EXPECT_EQ(ReadImageFile(image, "/none").kind, ImageFile::Kind::Missing);
+    EXPECT_EQ(ReadImageFile(image, "/none").error, ENOENT);
+}
+
+TEST_F(ImageFileTest, NoMoreIsReadThanIsAskedFor) {
+    Write("/x", "0123456789");
+    EXPECT_EQ(ReadImageFile(image, "/x", 4).content, "0123");
+}
+
+class SharedNamesTest : public support::HostFixture {
+protected:
+    void Add(const std::string& path, const std::vector<SharedPart>& parts,
+             const std::vector<std::string>& exports) {
+        NativeReading reading;
+        reading.plugin.place.path = path;
+        reading.sharedParts = parts;
+        reading.exports = exports;
+        names.Add(reading);
+    }
+
+    SharedNames names;
+};
+
+TEST_F(SharedNamesTest, AnEntryThatAnotherExportsTooIsToldOfEachThatLooksItUp) {
+    Add("a.so", {{"the start entry", "start"}}, {"start", "metadata"});
+    Add("b.so", {}, {"metadata", "start"});
+    Add("c.so", {{"the start entry", "begin"}}, {"begin"});
+    Add("d.so", {{"the start entry", "start"}}, {"start"});
+    names.Report(findings);
+    EXPECT_THAT(Found(),
+                ElementsAre("a.so:0 error taken-over: the start entry is looked up by its "
+                            "exported name \"start\", which is exported by b.so, d.so too: "
+                            "whichever is loaded first serves all of them",
+                            "d.so:0 error taken-over: the start entry is looked up by its "
+                            "exported name \"start\", which is exported by a.so, b.so too: "
+                            "whichever is loaded first serves all of them"));
+}
+
+TEST_F(SharedNamesTest, OfManyThreeAreNamed) {
+    for (const char* const path : {"a", "b", "c", "d", "e", "f"}) {
+        Add(path, {}, {"start"});
+    }
+    Add("x", {{"the start entry", "start"}}, {"start"});
+    names.Report(findings);
+    EXPECT_THAT(Found(), ElementsAre("x:0 error taken-over: the start entry is looked up by its "
+                                     "exported name \"start\", which is exported by a, b, c and "
+                                     "3 more too: whichever is loaded first serves all of them"));
+}
+
+}  // namespace
+
+}  // namespace vantor::analyze
