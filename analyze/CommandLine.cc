@@ -21,6 +21,7 @@
 #include "verbs/Simulate.h"
 #include "verbs/Trace.h"
 #include "verbs/Verify.h"
+#include "verify/Wording.h"
 
 namespace vantor::analyze {
 
@@ -95,7 +96,7 @@ std::string DescribeMistake(const CLI::App& app, const CLI::ParseError& error) {
 }
 
 int Fail(const Invocation& invocation, std::string_view what) {
-    invocation.error << programName << ": " << what << '\n';
+    invocation.error << programName << ": " << OnOneLine(std::string(what)) << '\n';
     return statusCouldNotLook;
 }
 

@@ -45,7 +45,10 @@ function(vantor_install_documents component)
 endfunction()
 
 # vantor: the program, the one that looks at its boots, and all that the host boots it with.
-install(TARGETS vantor vantor-analyze RUNTIME DESTINATION sbin COMPONENT vantor)
+install(TARGETS vantor RUNTIME DESTINATION sbin COMPONENT vantor)
+if(TARGET vantor-analyze)
+    install(TARGETS vantor-analyze RUNTIME DESTINATION sbin COMPONENT vantor)
+endif()
 install(DIRECTORY DESTINATION libexec/vantor/plugins COMPONENT vantor)
 install(PROGRAMS ${vantorPackaging}/vantor.init DESTINATION /etc/init.d
     RENAME vantor COMPONENT vantor)

@@ -8,6 +8,7 @@
 #include <memory>
 #include <optional>
 #include <set>
+#include <sstream>
 #include <stdexcept>
 #include <string>
 #include <vector>
@@ -233,9 +234,28 @@ int Run(const DiffOptions& options, const Invocation& invocation) {
     } else {
         WriteText(result, invocation);
     }
+    const Change& total = result.comparison.total;
     const bool fails =
-        options.failOver >= 0 && result.comparison.total.Growth() * 100 > options.failOver;
+        options.failOver >= 0 && total.IsSlower() && total.Growth() * 100 > options.failOver;
+    if (fails) {
+        invocation.error << fmt::format("vantor-analyze: the total grew by more than {} %\n",
+                                        options.failOver);
+    }
     return fails ? statusErrors : statusClean;
+}
+
+// A number from 0 to `most`; "nan" is not.
+CLI::Validator UpTo(double most) {
+    return CLI::Validator(
+        [most](std::string& text) {
+            std::istringstream stream(text);
+            double number = 0;
+            const bool fits = stream >> number &&
+                              stream.peek() == std::istringstream::traits_type::eof() &&
+                              number >= 0 && number <= most;
+            return fits ? std::string() : fmt::format("{} is no number from 0 to {:g}", text, most);
+        },
+        "");
 }
 
 void AddOptions(CLI::App& verb, DiffOptions& options) {
@@ -252,17 +272,17 @@ void AddOptions(CLI::App& verb, DiffOptions& options) {
     verb.add_option("--least", options.leastMilliseconds,
                     "Differences up to so many milliseconds are noise")
         ->type_name("MS")
-        ->check(CLI::Range(0.0, 1e9))
+        ->check(UpTo(1e9))
         ->capture_default_str();
     verb.add_option("--margin", options.marginPercent,
                     "With one boot on a side, differences up to so many per cent are noise")
         ->type_name("PERCENT")
-        ->check(CLI::Range(0.0, 1e6))
+        ->check(UpTo(1e6))
         ->capture_default_str();
     verb.add_option("--fail-over", options.failOver,
                     "Exit with status 2 when the total grew by more per cent")
         ->type_name("PERCENT")
-        ->check(CLI::Range(0.0, 1e6));
+        ->check(UpTo(1e6));
     AddFormatOption(verb, options.format);
 }
 

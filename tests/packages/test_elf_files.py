@@ -11,7 +11,8 @@ RUNTIME = ["libc.so.6", "libgcc_s.so.1", "libstdc++.so.6"]
 NEEDED = {
     "vantor/usr/sbin/vantor": [
         "libbasekit.so", "libboost_filesystem.so.1.74.0", "libboost_iostreams.so.1.74.0",
-        "libboost_regex.so.1.74.0", "libnvkctl.so", *RUNTIME],
+        "libnvkctl.so", *RUNTIME],
+    "vantor/usr/sbin/vantor-analyze": ["libelf.so.1", "libfmt.so.9", "libm.so.6", *RUNTIME],
     "vantor-hostlibs/usr/bin/nvcli": ["libbasekit.so", *RUNTIME],
     "vantor-hostlibs/usr/lib/*/libbasekit.so": RUNTIME,
     "vantor-hostlibs/usr/lib/*/libnvkctl.so": RUNTIME,

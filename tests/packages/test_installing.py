@@ -80,7 +80,7 @@ def test_an_upgrade_renews_settings_that_nobody_changed(host, packages, tmp_path
 
 PLUGIN = '''{"metadata": {"version": 1, "requires": ["storag"], "provides": []},
 "operations": {"start": []}}'''
-FOUND = "vantor: vantor-analyze verify finds in the plugin directory:"
+FOUND = "vantor: vantor-analyze verify says of the plugin directory:"
 
 
 def test_installing_a_plugin_tells_what_is_wrong_with_it(host, tmp_path):

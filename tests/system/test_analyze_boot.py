@@ -328,6 +328,27 @@ def test_diff_is_a_gate_for_the_total(analyze, logs, limit, status):
     assert done.status == status
 
 
+def test_diff_is_no_gate_for_noise(analyze, logs):
+    old = [logs("old"), logs("old2", end="190")]
+    new = [logs("new", end="110"), logs("new2", end="195")]
+    done = analyze("diff", "--old", *old, "--new", *new, "--fail-over=1")
+    assert "within the noise" in done.stdout
+    assert (done.status, done.stderr) == (0, "")
+
+
+def test_diff_says_that_the_total_grew_too_much(analyze, logs):
+    done = analyze("diff", logs("old"), logs("new", end="160"), "--fail-over=10")
+    assert done.stderr == "vantor-analyze: the total grew by more than 10 %\n"
+
+
+@pytest.mark.parametrize("value", ["nan", "-1", "1e7", "inf", "1x", ""])
+@pytest.mark.parametrize("option", ["--margin", "--fail-over"])
+def test_diff_takes_no_share_that_is_none(analyze, logs, option, value):
+    done = analyze("diff", logs("old"), logs("new"), f"{option}={value}")
+    assert (done.status, done.stdout) == (3, "")
+    assert f"{value} is no number from 0 to 1e+06" in done.stderr
+
+
 def test_diff_needs_both_sides(analyze, logs):
     one = logs("one")
     for arguments in ([], [one], ["--old", one], [one, one, "--old", one]):
