@@ -100,11 +100,16 @@ BootModel Directory::Read() {
 }
 
 void Directory::CheckFolders() {
-    ownership.CheckFoldersOf(Join(options.directory, "."), findings);
-    const ImageFile configuration = ReadImageFile(image, HostImage::debugConfiguration, 0);
-    ownership.CheckFoldersOf(HostImage::debugConfiguration, findings);
-    if (configuration.kind != ImageFile::Kind::Missing) {
-        ownership.Check(HostImage::debugConfiguration, configuration.status, findings);
+    for (const std::string& folder :
+         {options.directory, std::string(HostImage::commandDescriptions)}) {
+        ownership.CheckFoldersOf(Join(folder, "."), findings);
+    }
+    for (const char* const path : {HostImage::debugConfiguration, HostImage::program}) {
+        const ImageFile file = ReadImageFile(image, path, 0);
+        ownership.CheckFoldersOf(path, findings);
+        if (file.kind != ImageFile::Kind::Missing) {
+            ownership.Check(path, file.status, findings);
+        }
     }
 }
 

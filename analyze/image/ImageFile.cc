@@ -113,7 +113,7 @@ std::vector<std::string> ListImageFolder(const HostImage& image, const std::stri
         if (own >= 0) {
             close(own);
         }
-        throw std::system_error(error, std::generic_category(), path);
+        throw std::system_error(error, std::generic_category(), image.Open(path));
     }
     const std::unique_ptr<DIR, CloseDirectory> listing(opened);
     std::vector<std::string> names;

@@ -41,7 +41,13 @@ void AddBootOptions(CLI::App& verb, BootSource& source, DirectoryAs directory) {
         ->type_name(directory == DirectoryAs::Argument ? "" : "DIRECTORY")
         ->capture_default_str();
     AddEach(verb, "--root", "FOLDER", "Read the host whose file system lies in FOLDER",
-            [&source](const std::string& text) { source.root = text; });
+            [&source](const std::string& text) {
+                // The machine's own host would be read for a variable that nobody set.
+                if (text.empty()) {
+                    throw CLI::ValidationError("--root", "the folder has no name");
+                }
+                source.root = text;
+            });
     AddEach(verb, "--plugin-flags", "FLAG,...", "The boot flags; the last occurrence counts",
             [&source](const std::string& text) {
                 const std::vector<std::string> items = SplitList(text);

@@ -185,8 +185,13 @@ def test_another_directory_of_the_host(root):
 def test_a_directory_that_cannot_be_read(root):
     result = analyze(root, "verify", "/nowhere")
     assert (result.status, result.stdout) == (3, "")
-    assert result.stderr.startswith("vantor-analyze: ") and "/nowhere" in result.stderr, result
-    assert result.stderr.endswith(": No such file or directory\n"), result
+    assert result.stderr == f"vantor-analyze: {root.folder}/nowhere: No such file or directory\n"
+
+
+def test_a_root_without_a_name_is_refused(root):
+    result = run_analyze(root, "verify", "--root=")
+    assert (result.status, result.stdout) == (3, "")
+    assert "the folder has no name" in result.stderr
 
 
 @pytest.mark.parametrize("arguments, message", [

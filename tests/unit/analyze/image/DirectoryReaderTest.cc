@@ -176,6 +176,16 @@ TEST_F(DirectoryReaderTest, WhatOthersMayWriteIsTold) {
                                     "root: everybody (mode 0646)"));
 }
 
+TEST_F(DirectoryReaderTest, WhoMayChangeTheProgramOrItsCommandsIsTold) {
+    WritePlugin("a.json", DocumentText().Text());
+    Write("/usr/sbin/vantor", "no program");
+    chmod((folder.Path() + "/usr/sbin/vantor").c_str(), 0757);
+    Write("/usr/lib/nuvex/nvcli/none.json", "{\"commands\": []}");
+    chmod((folder.Path() + "/usr/lib/nuvex/nvcli").c_str(), 0775);
+    Read();
+    EXPECT_EQ(Found("writable").size(), 2U);
+}
+
 TEST_F(DirectoryReaderTest, CommandsThatNobodyKnowsAreTold) {
     Write("/usr/lib/nuvex/nvcli/none.json", "{\"commands\": []}");
     DocumentText document;
