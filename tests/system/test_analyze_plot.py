@@ -15,7 +15,6 @@ from harness import boot_texts, browser
 BUILD = os.environ.get("VANTOR_BUILD_DIR",
                        pathlib.Path(__file__).resolve().parents[2] / "build" / "default")
 ANALYZE = os.path.join(os.path.realpath(BUILD), "bin", "vantor-analyze")
-VANTOR = os.path.join(os.path.realpath(BUILD), "bin", "vantor")
 SVG = "{http://www.w3.org/2000/svg}"
 
 needs_browser = pytest.mark.skipif(
@@ -70,8 +69,6 @@ function facts() {
 
 def analyze(*arguments):
     """A run of the program on this machine, its outputs as bytes."""
-    if not os.path.exists(ANALYZE) and b"__tsan_" in pathlib.Path(VANTOR).read_bytes():
-        pytest.skip("vantor-analyze has one thread and is not built with the thread sanitizer")
     return subprocess.run([ANALYZE, *map(str, arguments)], capture_output=True, check=False,
                           timeout=240)
 

@@ -3,8 +3,6 @@
 import os
 import subprocess
 
-import pytest
-
 from harness.runner import ENVIRONMENT, Result
 from harness.waiting import LIMIT_SECONDS
 
@@ -16,8 +14,6 @@ def run_analyze(root, *arguments, stdout=None, environment=None):
 
     stdout          a descriptor in place of the recorded output
     """
-    if "tsan" in root.base.sanitizers:
-        pytest.skip(f"{NAME} has one thread and is not built with the thread sanitizer")
     command = [os.path.join(root.base.build, "bin", NAME), *arguments]
     done = subprocess.run(
         command, stdin=subprocess.DEVNULL, stdout=stdout or subprocess.PIPE, stderr=subprocess.PIPE,
