@@ -35,7 +35,7 @@ private:
         explicit TextBuffer(const std::string& text)
             : begin(const_cast<char*>(text.data())), end(begin + text.size()) {}
 
-        void StartAt(std::size_t offset) { setg(begin, begin + offset, end); }
+        void StartAt(std::size_t place) { setg(begin, begin + place, end); }
         std::size_t Offset() const { return static_cast<std::size_t>(gptr() - begin); }
 
     private:
