@@ -18,9 +18,10 @@ public:
     class Targets {
     public:
         Targets(const Node* from, const Node* to) : first(from), last(to) {}
-        // The names that a range has in the language.
-        const Node* begin() const { return first; }  // NOLINT(readability-identifier-naming)
-        const Node* end() const { return last; }     // NOLINT(readability-identifier-naming)
+        // NOLINTNEXTLINE(readability-identifier-naming): a range-based for calls it by this name
+        const Node* begin() const { return first; }
+        // NOLINTNEXTLINE(readability-identifier-naming): a range-based for calls it by this name
+        const Node* end() const { return last; }
         std::size_t Size() const { return static_cast<std::size_t>(last - first); }
         Node operator[](std::size_t i) const { return first[i]; }
 

@@ -1,5 +1,8 @@
 #include "verbs/BootOutput.h"
 
+#include <memory>
+
+#include "verbs/CommonOptions.h"
 #include "verbs/TextTable.h"
 
 namespace vantor::analyze {
@@ -19,6 +22,30 @@ void TellRemarks(const std::vector<std::string>& remarks, const Invocation& invo
     for (const std::string& remark : remarks) {
         invocation.error << "note: " << OneLine(remark) << '\n';
     }
+}
+
+void AddReportVerb(CLI::App& app, Invocation& invocation, const std::string& name,
+                   const std::string& description, const BootReport& report) {
+    struct Options {
+        LogSource source;
+        std::string format = "text";
+    };
+    auto options = std::make_shared<Options>();
+    CLI::App* const verb = app.add_subcommand(name, description);
+    AddLogOptions(*verb, options->source);
+    AddFormatOption(*verb, options->format);
+    verb->callback([options, report, &invocation] {
+        invocation.action = [options, report, &invocation] {
+            const BootTimeline timeline = options->source.Read();
+            if (options->format == "json") {
+                WriteJson(report.document(timeline), invocation.out);
+            } else {
+                report.text(timeline, invocation);
+                TellRemarks(timeline.remarks, invocation);
+            }
+            return statusClean;
+        };
+    });
 }
 
 std::string Count(std::size_t count, const std::string& what) {

@@ -2,10 +2,12 @@
 #define VANTOR_ANALYZE_VERBS_BOOTOUTPUT_H
 
 #include <CLI/CLI.hpp>
+#include <functional>
 #include <nlohmann/json.hpp>
 #include <string>
 #include <vector>
 
+#include "boot/BootTimeline.h"
 #include "verbs/Invocation.h"
 
 // What the verbs have in common that tell of a boot that has taken place.
@@ -22,6 +24,17 @@ void WriteJson(const Json& document, std::ostream& stream);
 
 // Tells on `invocation.error`, a line each, what does not fit between a log and its plugins.
 void TellRemarks(const std::vector<std::string>& remarks, const Invocation& invocation);
+
+// What a verb tells of one boot in either format. The text leaves the remarks to the caller.
+struct BootReport {
+    std::function<Json(const BootTimeline&)> document;
+    std::function<void(const BootTimeline&, const Invocation&)> text;
+};
+
+// Adds a verb that takes the options of a log and --format and writes the report, the remarks of a
+// text on `invocation.error`.
+void AddReportVerb(CLI::App& app, Invocation& invocation, const std::string& name,
+                   const std::string& description, const BootReport& report);
 
 // "1 worker", "8 workers".
 std::string Count(std::size_t count, const std::string& what);

@@ -2,24 +2,17 @@
 
 #include <fmt/format.h>
 
-#include <memory>
 #include <string>
 #include <vector>
 
 #include "boot/BootTimeline.h"
 #include "boot/CriticalChain.h"
 #include "verbs/BootOutput.h"
-#include "verbs/CommonOptions.h"
 #include "verbs/TextTable.h"
 
 namespace vantor::analyze {
 
 namespace {
-
-struct ChainOptions {
-    LogSource source;
-    std::string format = "text";
-};
 
 const std::string& NameOf(const BootTimeline& timeline, std::size_t entry) {
     return timeline.entries[entry].name;
@@ -45,9 +38,9 @@ std::string ReleaseText(const BootTimeline& timeline, const ChainLink& link) {
     return "nothing";
 }
 
-void WriteText(const BootTimeline& timeline, const std::vector<ChainLink>& chain,
-               const Invocation& invocation) {
+void WriteChain(const BootTimeline& timeline, const Invocation& invocation) {
     using Kind = TextTable::Kind;
+    const std::vector<ChainLink> chain = CriticalChain(timeline);
     Microseconds ran = 0;
     TextTable table({{"START", Kind::Number},
                      {"GAP", Kind::Number},
@@ -67,9 +60,9 @@ void WriteText(const BootTimeline& timeline, const std::vector<ChainLink>& chain
     table.Write(invocation.out, invocation.width);
 }
 
-Json Document(const BootTimeline& timeline, const std::vector<ChainLink>& chain) {
+Json ChainDocument(const BootTimeline& timeline) {
     Json links = Json::array();
-    for (const ChainLink& link : chain) {
+    for (const ChainLink& link : CriticalChain(timeline)) {
         const TimelineEntry& entry = timeline.entries[link.entry];
         Json item{{"plugin", entry.name},
                   {"start", entry.start},
@@ -89,29 +82,12 @@ Json Document(const BootTimeline& timeline, const std::vector<ChainLink>& chain)
             {"remarks", timeline.remarks}};
 }
 
-int Run(const ChainOptions& options, const Invocation& invocation) {
-    const BootTimeline timeline = options.source.Read();
-    const std::vector<ChainLink> chain = CriticalChain(timeline);
-    if (options.format == "json") {
-        WriteJson(Document(timeline, chain), invocation.out);
-    } else {
-        WriteText(timeline, chain, invocation);
-        TellRemarks(timeline.remarks, invocation);
-    }
-    return statusClean;
-}
-
 }  // namespace
 
 void AddChain(CLI::App& app, Invocation& invocation) {
-    auto options = std::make_shared<ChainOptions>();
-    CLI::App* const verb = app.add_subcommand(
-        "chain", "Show the plugins that decided when the boot ended, and what released each");
-    AddLogOptions(*verb, options->source);
-    AddFormatOption(*verb, options->format);
-    verb->callback([options, &invocation] {
-        invocation.action = [options, &invocation] { return Run(*options, invocation); };
-    });
+    AddReportVerb(app, invocation, "chain",
+                  "Show the plugins that decided when the boot ended, and what released each",
+                  {ChainDocument, WriteChain});
 }
 
 }  // namespace vantor::analyze

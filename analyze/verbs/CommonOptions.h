@@ -46,7 +46,6 @@ struct LogSource {
 };
 
 // Adds them to a verb whose argument is the log. `source` lives as long as the verb.
-
 void AddLogOptions(CLI::App& verb, LogSource& source);
 
 }  // namespace vantor::analyze

@@ -15,10 +15,10 @@ constexpr int statusCouldNotLook = 3;
 // One call of the program. A verb's registration adds its subcommand to the command line; when that
 // is the one chosen, its callback leaves here what is to be done once the whole line is read.
 struct Invocation {
-    std::ostream& out;    // the result
-    std::ostream& error;  // what went wrong, and progress
-    bool colour = false;  // `out` is a terminal that shows colours
-    int width = 0;        // columns of the terminal that `out` is; 0 when it is none
+    std::ostream& out;      // the result
+    std::ostream& error;    // what went wrong, and progress
+    bool colour = false;    // `out` is a terminal that shows colours
+    int width = 0;          // columns of the terminal that `out` is; 0 when it is none
     bool progress = false;  // `error` is a terminal: say so when work takes over a second
 
     // Returns the exit status. What it throws is told on `error` and gives statusCouldNotLook.

@@ -11,7 +11,8 @@ namespace vantor {
 namespace {
 
 struct NameOf {
-    using type = std::string;  // NOLINT(readability-identifier-naming): the set asks for it
+    // NOLINTNEXTLINE(readability-identifier-naming): the intrusive set looks for `type`
+    using type = std::string;
     const type& operator()(const InitBarrier& barrier) const { return barrier.Name(); }
 };
 
