@@ -4,9 +4,12 @@
 #include <stdlib.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <cerrno>
 #include <memory>
+#include <new>
 #include <optional>
+#include <stdexcept>
 #include <system_error>
 #include <utility>
 
@@ -15,6 +18,7 @@
 #include "image/DebugDescription.h"
 #include "image/DocumentDescription.h"
 #include "image/ImageFile.h"
+#include "image/LinkScope.h"
 #include "image/NativeDescription.h"
 #include "image/Ownership.h"
 #include "image/SharedNames.h"
@@ -55,13 +59,14 @@ public:
           bootFolder(Absolute(options.directory)),
           runOnceRecord(options.runOncePlugins),
           debug(image, findings),
-          commands(image, findings),
-          ownership(image) {}
+          ownership(image),
+          commands(image, ownership, findings) {}
 
     BootModel Read();
 
 private:
     void CheckFolders();
+    void DropRefused(const std::set<std::string>& paths);
     std::optional<Architecture> FindArchitecture(const std::vector<std::string>& names) const;
     void ReadFile(const std::string& fileName);
     void ReadPlugin(const PluginFile& file);
@@ -77,21 +82,30 @@ private:
     const std::string bootFolder;  // the directory as the boot's messages name it
     std::set<std::string> runOnceRecord;
     DebugDescription debug;
-    CommandDescriptions commands;
     Ownership ownership;
+    CommandDescriptions commands;
+    std::optional<LinkScope> scope;  // made for the first native plugin
     SharedNames sharedNames;
     std::optional<Architecture> boot;
     BootModel model;
 };
 
 BootModel Directory::Read() {
+    if (image.IsElsewhere() && (options.directory.empty() || options.directory.front() != '/')) {
+        throw std::runtime_error(options.directory +
+                                 ": the directory of a host in a folder begins with \"/\"");
+    }
     const std::vector<std::string> names = ListImageFolder(image, options.directory);
     CheckFolders();
     boot = FindArchitecture(names);
     for (const std::string& name : names) {
         ReadFile(name);
     }
-    sharedNames.Report(findings);
+    commands.CheckFolders(model, findings);
+    if (scope) {
+        DropRefused(scope->Report(findings));
+        sharedNames.Report(*scope, findings);
+    }
     for (PluginDescription& plugin : debug.OfConfiguration(findings)) {
         model.plugins.push_back(std::move(plugin));
     }
@@ -99,11 +113,19 @@ BootModel Directory::Read() {
     return std::move(model);
 }
 
+// What the linker refuses is known only when all is there.
+void Directory::DropRefused(const std::set<std::string>& paths) {
+    const auto isRefused = [&](const PluginDescription& plugin) {
+        return paths.count(plugin.place.path) != 0;
+    };
+    model.plugins.erase(std::remove_if(model.plugins.begin(), model.plugins.end(), isRefused),
+                        model.plugins.end());
+    model.notLoaded.insert(model.notLoaded.end(), paths.begin(), paths.end());
+    sharedNames.Forget(paths);
+}
+
 void Directory::CheckFolders() {
-    for (const std::string& folder :
-         {options.directory, std::string(HostImage::commandDescriptions)}) {
-        ownership.CheckFoldersOf(Join(folder, "."), findings);
-    }
+    ownership.CheckFoldersOf(Join(options.directory, "."), findings);
     for (const char* const path : {HostImage::debugConfiguration, HostImage::program}) {
         const ImageFile file = ReadImageFile(image, path, 0);
         ownership.CheckFoldersOf(path, findings);
@@ -153,7 +175,14 @@ void Directory::ReadFile(const std::string& fileName) {
         file.name.erase(0, libraryPrefix.size());
     }
     if (file.extension == "so" || file.extension == "json" || file.extension == "debug") {
-        ReadPlugin(file);
+        try {
+            ReadPlugin(file);
+        } catch (const std::bad_alloc&) {
+            findings.push_back({Severity::Error,
+                                "unreadable",
+                                {Join(options.directory, fileName), 0, 0},
+                                "cannot be read: " + std::generic_category().message(ENOMEM)});
+        }
     } else {
         ignore("unknown type (" + file.extension + ")");
     }
@@ -162,6 +191,7 @@ void Directory::ReadFile(const std::string& fileName) {
 void Directory::ReadPlugin(const PluginFile& file) {
     const PluginSource source{{Join(options.directory, file.fileName), 0, 0},
                               Join(bootFolder, file.fileName)};
+    const std::size_t before = model.plugins.size();
     if (file.extension == "so") {
         ReadNativeFile(file, source);
     } else if (file.extension == "json") {
@@ -170,6 +200,10 @@ void Directory::ReadPlugin(const PluginFile& file) {
         for (PluginDescription& plugin : debug.OfMarker(file.name, source.place, findings)) {
             model.plugins.push_back(std::move(plugin));
         }
+        return;
+    }
+    if (model.plugins.size() == before) {
+        model.notLoaded.push_back(source.place.path);
     }
 }
 
@@ -205,9 +239,14 @@ void Directory::ReadNativeFile(const PluginFile& file, const PluginSource& sourc
         Reject(source, "not a regular file");
     } else {
         // Without any ELF file in the directory every architecture refuses this one alike.
+        const Architecture architecture = boot.value_or(Architecture{});
+        if (!scope) {
+            scope.emplace(image, architecture);
+        }
         std::optional<NativeReading> reading =
-            ReadNative(object.content, boot.value_or(Architecture{}), source, findings);
+            ReadNative(object.content, architecture, source, findings, &*scope);
         if (reading) {
+            scope->Keep(source);
             sharedNames.Add(*reading);
             Add(file, std::move(reading->plugin));
         }

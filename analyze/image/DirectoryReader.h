@@ -22,7 +22,8 @@ struct BootOptions {
 // Reads every plugin that a boot with these options would, without loading or running any: native
 // plugins from their ELF file, documents, and debug entries. What a boot would ignore or reject is
 // left out of the model and told in `findings`, in no particular order. Throws std::system_error
-// when the directory itself cannot be read.
+// when the directory itself cannot be read, std::runtime_error when it is no path of a host that
+// lies in a folder.
 BootModel ReadPlugins(const HostImage& image, const BootOptions& options, Findings& findings);
 
 }  // namespace vantor::analyze

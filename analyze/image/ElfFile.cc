@@ -1,5 +1,7 @@
 #include "image/ElfFile.h"
 
+#include <limits.h>
+
 #include <algorithm>
 
 namespace vantor::analyze {
@@ -45,6 +47,11 @@ void ElfFile::ReadSegments() {
         if (header.p_type == PT_DYNAMIC) {
             dynamicHeader = header;
         }
+        if (header.p_type == PT_INTERP && header.p_offset < content.size()) {
+            const std::string_view rest = std::string_view(content).substr(
+                static_cast<std::size_t>(header.p_offset), PATH_MAX);
+            interpreter = rest.substr(0, rest.find('\0'));
+        }
         if (header.p_type != PT_LOAD || header.p_memsz == 0) {
             continue;
         }
@@ -75,6 +82,9 @@ void ElfFile::ReadDynamic(const GElf_Phdr& header) {
             break;
         }
         dynamic[entry.d_tag] = entry.d_un.d_val;
+        if (entry.d_tag == DT_NEEDED) {
+            needed.push_back(entry.d_un.d_val);
+        }
     }
 }
 

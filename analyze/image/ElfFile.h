@@ -50,6 +50,12 @@ public:
     // The entry of the dynamic section with that tag (DT_...), the last of several.
     std::optional<std::uint64_t> Dynamic(std::int64_t tag) const;
 
+    // The path of the dynamic linker that a program asks for; empty where it asks for none.
+    const std::string& Interpreter() const { return interpreter; }
+
+    // The values of all entries DT_NEEDED, in the order of the file.
+    const std::vector<std::uint64_t>& Needed() const { return needed; }
+
     // A table of the file as libelf converts it: at most `count` entries of a type. Null where not
     // all of it is in the file. Valid as long as this object.
     Elf_Data* Table(std::uint64_t address, std::uint64_t count, Elf_Type type) const;
@@ -72,6 +78,8 @@ private:
     std::unique_ptr<Elf, EndElf> handle;
     std::vector<Segment> segments;  // by address
     std::map<std::int64_t, std::uint64_t> dynamic;
+    std::vector<std::uint64_t> needed;
+    std::string interpreter;
 };
 
 }  // namespace vantor::analyze

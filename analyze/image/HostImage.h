@@ -21,6 +21,9 @@ public:
     // Where a path of the host is to be opened here. A relative path is left as it is.
     std::string Open(const std::string& path) const;
 
+    // Whether it is another one than this machine's own.
+    bool IsElsewhere() const { return !root.empty(); }
+
 private:
     std::string root;  // without a slash at its end
 };

@@ -228,6 +228,11 @@ JsonPositions::JsonPositions(const std::string& documentText) {
          end = documentText.find('\n', end + 1)) {
         lines.push_back(end + 1);
     }
+    for (std::size_t offset = 0; offset < documentText.size(); ++offset) {
+        if ((static_cast<unsigned char>(documentText[offset]) & 0xc0U) == 0x80U) {
+            within.push_back(offset);
+        }
+    }
 }
 
 JsonPositions::Position JsonPositions::Of(const DocumentPlace& place) const {
@@ -251,8 +256,11 @@ JsonPositions::Position JsonPositions::At(std::size_t offset) const {
         constexpr std::size_t largest = std::numeric_limits<int>::max();
         return static_cast<int>(std::min(number, largest));
     };
+    const std::size_t start = *std::prev(next);
+    const auto continued = std::lower_bound(within.begin(), within.end(), offset) -
+                           std::lower_bound(within.begin(), within.end(), start);
     return {narrow(static_cast<std::size_t>(next - lines.begin())),
-            narrow(offset - *std::prev(next) + 1)};
+            narrow(offset - start - static_cast<std::size_t>(continued) + 1)};
 }
 
 }  // namespace vantor::analyze

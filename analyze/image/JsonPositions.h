@@ -27,7 +27,7 @@ public:
     };
     End Ending() const { return ending; }
 
-    // Both counted from 1, the column in bytes.
+    // Both counted from 1, the column in characters of UTF-8.
     struct Position {
         int line;
         int column;
@@ -53,7 +53,8 @@ private:
     End ending = End::Whole;
     std::size_t stop = 0;
     Value root;
-    std::vector<std::size_t> lines;  // where each begins
+    std::vector<std::size_t> lines;   // where each begins
+    std::vector<std::size_t> within;  // bytes that continue a character
 };
 
 }  // namespace vantor::analyze

@@ -4,6 +4,7 @@
 #include <stdexcept>
 #include <utility>
 
+#include "image/LinkScope.h"
 #include "image/LinkerRefusal.h"
 #include "image/SharedObject.h"
 #include "plugins/Exceptions.h"
@@ -196,8 +197,8 @@ std::string MadeFor(const std::string& content, const Architecture& boot) {
 // One shared object on its way to a description.
 class NativeReader {
 public:
-    NativeReader(const PluginSource& pluginSource, Findings& allFindings)
-        : source(pluginSource), findings(allFindings) {
+    NativeReader(const PluginSource& pluginSource, Findings& allFindings, LinkScope* linkScope)
+        : source(pluginSource), findings(allFindings), scope(linkScope) {
         reading.plugin.place = source.place;
     }
 
@@ -218,6 +219,7 @@ private:
 
     const PluginSource& source;
     Findings& findings;
+    LinkScope* const scope;
     NativeReading reading;
 };
 
@@ -316,6 +318,9 @@ std::optional<NativeReading> NativeReader::Read(const std::string& content,
             return std::nullopt;
         }
         const SharedObject object(file);
+        if (scope != nullptr) {
+            scope->Open(source, ReadLinkage(object));
+        }
         if (!ReadRecords(object)) {
             return std::nullopt;
         }
@@ -334,8 +339,9 @@ std::optional<NativeReading> NativeReader::Read(const std::string& content,
 }  // namespace
 
 std::optional<NativeReading> ReadNative(const std::string& content, const Architecture& boot,
-                                        const PluginSource& source, Findings& findings) {
-    return NativeReader(source, findings).Read(content, boot);
+                                        const PluginSource& source, Findings& findings,
+                                        LinkScope* scope) {
+    return NativeReader(source, findings, scope).Read(content, boot);
 }
 
 }  // namespace vantor::analyze

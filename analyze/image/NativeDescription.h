@@ -11,6 +11,8 @@
 
 namespace vantor::analyze {
 
+class LinkScope;
+
 // A part of a plugin that the linker looks up by name in all loaded objects.
 struct SharedPart {
     std::string what;    // as a sentence names it: "the start entry"
@@ -32,9 +34,11 @@ struct PluginSource {
 
 // Reads a shared object's `operations` and `metadata` (vantor/plugin.h), of any version, without
 // loading it. `boot` is the architecture that the boot is of. What the boot would reject, and what
-// it could not survive, is told in `findings` and gives no reading.
+// it could not survive, is told in `findings` and gives no reading. An object that the linker
+// opens, as far as this file tells, is told to `scope`, which may be null.
 std::optional<NativeReading> ReadNative(const std::string& content, const Architecture& boot,
-                                        const PluginSource& source, Findings& findings);
+                                        const PluginSource& source, Findings& findings,
+                                        LinkScope* scope = nullptr);
 
 }  // namespace vantor::analyze
 

@@ -1,13 +1,10 @@
 #include "image/SharedNames.h"
 
-#include <cstddef>
-#include <unordered_map>
+#include <algorithm>
 
 namespace vantor::analyze {
 
 namespace {
-
-using Exporters = std::vector<std::size_t>;  // objects, ascending
 
 constexpr std::size_t mostNamed = 3;  // exporters in one sentence
 
@@ -17,7 +14,14 @@ void SharedNames::Add(const NativeReading& reading) {
     objects.push_back({reading.plugin.place, reading.sharedParts, reading.exports});
 }
 
-void SharedNames::Report(Findings& findings) const {
+void SharedNames::Forget(const std::set<std::string>& paths) {
+    objects.erase(
+        std::remove_if(objects.begin(), objects.end(),
+                       [&](const Object& object) { return paths.count(object.place.path) != 0; }),
+        objects.end());
+}
+
+std::unordered_map<std::string, SharedNames::Exporters> SharedNames::FindExporters() const {
     std::unordered_map<std::string, Exporters> exporters;
     for (const Object& object : objects) {
         for (const SharedPart& part : object.parts) {
@@ -33,29 +37,43 @@ void SharedNames::Report(Findings& findings) const {
             }
         }
     }
+    return exporters;
+}
+
+std::string SharedNames::Others(const Exporters& exporters, std::size_t object) const {
+    std::string others;
+    std::size_t count = 0;
+    // Beyond those that are named the number is enough: no list grows with the directory.
+    for (std::size_t at = 0; at < exporters.size() && count < mostNamed; ++at) {
+        if (exporters[at] != object) {
+            others += (count == 0 ? "" : ", ") + objects[exporters[at]].place.path;
+            ++count;
+        }
+    }
+    if (count > 0 && exporters.size() - 1 > count) {
+        others += " and " + std::to_string(exporters.size() - 1 - count) + " more";
+    }
+    return others;
+}
+
+void SharedNames::Report(const LinkScope& scope, Findings& findings) const {
+    const std::unordered_map<std::string, Exporters> exporters = FindExporters();
     for (std::size_t i = 0; i < objects.size(); ++i) {
         for (const SharedPart& part : objects[i].parts) {
-            std::string others;
-            std::size_t count = 0;
-            const Exporters& all = exporters[part.symbol];
-            // Beyond those that are named the number is enough: no list grows with the directory.
-            for (std::size_t at = 0; at < all.size() && count < mostNamed; ++at) {
-                if (all[at] != i) {
-                    others += (count == 0 ? "" : ", ") + objects[all[at]].place.path;
-                    ++count;
-                }
-            }
-            if (count == 0) {
+            const std::string library = scope.Exporter(part.symbol);
+            const std::string others = Others(exporters.at(part.symbol), i);
+            std::string who;
+            if (!library.empty()) {
+                who = library + " too, which the boot program has loaded before: it serves this "
+                                "plugin";
+            } else if (!others.empty()) {
+                who = others + " too: whichever is loaded first serves all of them";
+            } else {
                 continue;
-            }
-            const std::size_t unnamed = all.size() - 1 - count;
-            if (unnamed > 0) {
-                others += " and " + std::to_string(unnamed) + " more";
             }
             findings.push_back({Severity::Error, "taken-over", objects[i].place,
                                 part.what + " is looked up by its exported name \"" + part.symbol +
-                                    "\", which is exported by " + others +
-                                    " too: whichever is loaded first serves all of them"});
+                                    "\", which is exported by " + who});
         }
     }
 }

@@ -14,9 +14,9 @@ bool IsExported(const GElf_Sym& symbol) {
     const unsigned type = GELF_ST_TYPE(symbol.st_info);
     const unsigned visibility = GELF_ST_VISIBILITY(symbol.st_other);
     const bool global = binding == STB_GLOBAL || binding == STB_WEAK || binding == STB_GNU_UNIQUE;
-    const bool hasAddress = symbol.st_value != 0 || symbol.st_shndx == SHN_ABS;
+    const bool hasAddress = symbol.st_value != 0 || symbol.st_shndx == SHN_ABS || type == STT_TLS;
     const bool dataOrCode = type == STT_NOTYPE || type == STT_OBJECT || type == STT_FUNC ||
-                            type == STT_COMMON || type == STT_GNU_IFUNC;
+                            type == STT_COMMON || type == STT_TLS || type == STT_GNU_IFUNC;
     return global && symbol.st_shndx != SHN_UNDEF && hasAddress && dataOrCode &&
            (visibility == STV_DEFAULT || visibility == STV_PROTECTED);
 }
@@ -45,10 +45,11 @@ void SharedObject::ReadSymbols() {
     if (symbolCount == 0) {
         return;
     }
-    Elf_Data* const symbols = file.Table(*table, symbolCount, ELF_T_SYM);
+    symbols = file.Table(*table, symbolCount, ELF_T_SYM);
     if (symbols == nullptr) {
         throw ElfError("the symbol table lies outside of the file");
     }
+    isLookedUp.resize(static_cast<std::size_t>(symbolCount));
     for (std::uint64_t i = 0; i < symbolCount; ++i) {
         GElf_Sym symbol;
         if (gelf_getsym(symbols, static_cast<int>(i), &symbol) != nullptr && IsExported(symbol)) {
@@ -58,7 +59,7 @@ void SharedObject::ReadSymbols() {
 }
 
 void SharedObject::AddExport(const GElf_Sym& symbol) {
-    const std::string_view name = Name(symbol);
+    const std::string_view name = NameAt(symbol.st_name);
     if (!name.empty()) {
         exports.push_back({name, symbol.st_value, symbol.st_size});
     }
@@ -104,11 +105,11 @@ std::uint64_t SharedObject::CountHashedSymbols(std::uint64_t hash) const {
     }
 }
 
-std::string_view SharedObject::Name(const GElf_Sym& symbol) const {
-    if (symbol.st_name >= names.size()) {
+std::string_view SharedObject::NameAt(std::uint64_t offset) const {
+    if (offset >= names.size()) {
         return {};
     }
-    const std::string_view rest = names.substr(symbol.st_name, longestName);
+    const std::string_view rest = names.substr(static_cast<std::size_t>(offset), longestName);
     const std::size_t end = rest.find('\0');
     return end == std::string_view::npos ? std::string_view() : rest.substr(0, end);
 }
@@ -130,6 +131,7 @@ void SharedObject::ReadRelocations(std::int64_t tableTag, std::int64_t sizeTag, 
     if (data == nullptr) {
         throw ElfError("a table of relocations lies outside of the file");
     }
+    const bool atLoad = tableTag != DT_JMPREL || BindsAtLoad();
     for (std::uint64_t i = 0; i < count; ++i) {
         GElf_Rela entry{};
         if (withAddends) {
@@ -142,7 +144,33 @@ void SharedObject::ReadRelocations(std::int64_t tableTag, std::int64_t sizeTag, 
         relocations.push_back(
             {entry.r_offset, static_cast<std::uint32_t>(GELF_R_TYPE(entry.r_info)),
              static_cast<std::uint32_t>(GELF_R_SYM(entry.r_info)), entry.r_addend, withAddends});
+        AddImport(relocations.back().symbol, atLoad);
     }
+}
+
+// The table of function calls is read last, so what data refers to too is there already.
+void SharedObject::AddImport(std::uint32_t symbolIndex, bool atLoad) {
+    if (symbolIndex == 0 || symbolIndex >= isLookedUp.size() || isLookedUp[symbolIndex]) {
+        return;
+    }
+    isLookedUp[symbolIndex] = true;
+    GElf_Sym symbol;
+    if (gelf_getsym(symbols, static_cast<int>(symbolIndex), &symbol) == nullptr ||
+        symbol.st_shndx != SHN_UNDEF || GELF_ST_BIND(symbol.st_info) != STB_GLOBAL) {
+        return;
+    }
+    const std::string_view name = NameAt(symbol.st_name);
+    if (!name.empty()) {
+        imports.push_back({name, atLoad});
+    }
+}
+
+bool SharedObject::BindsAtLoad() const {
+    constexpr std::uint64_t now = DF_BIND_NOW;
+    constexpr std::uint64_t nowToo = DF_1_NOW;
+    return file.Dynamic(DT_BIND_NOW).has_value() ||
+           (file.Dynamic(DT_FLAGS).value_or(0) & now) != 0 ||
+           (file.Dynamic(DT_FLAGS_1).value_or(0) & nowToo) != 0;
 }
 
 SharedObject::Meaning SharedObject::MeaningOf(std::uint16_t machine, std::uint32_t type) {
@@ -240,7 +268,7 @@ std::optional<LoadedPointer> SharedObject::ToSymbol(const Relocation& relocation
     const bool shared = IsExported(symbol) && !looksInItselfFirst &&
                         GELF_ST_VISIBILITY(symbol.st_other) == STV_DEFAULT;
     return LoadedPointer{LoadedPointer::Kind::Inside, Wrapped(symbol.st_value + addend),
-                         shared ? Name(symbol) : std::string_view()};
+                         shared ? NameAt(symbol.st_name) : std::string_view()};
 }
 
 }  // namespace vantor::analyze

@@ -44,6 +44,18 @@ public:
     const std::vector<Symbol>& Exports() const { return exports; }
     const Symbol* Find(std::string_view name) const;
 
+    // A symbol that the object does not define itself and cannot do without.
+    struct Import {
+        std::string_view name;
+        bool atLoad;  // else a lazy linker looks for it when the function is first called
+    };
+
+    // Each once, in the order in which the linker looks for them.
+    const std::vector<Import>& Imports() const { return imports; }
+
+    // A text of the object's own table of names; empty where none is.
+    std::string_view NameAt(std::uint64_t offset) const;
+
     // Empty where none is loaded, or where a relocation stands that is not known.
     std::optional<LoadedPointer> Pointer(std::uint64_t address) const;
 
@@ -63,8 +75,9 @@ private:
     std::uint64_t CountSymbols() const;
     std::uint64_t CountHashedSymbols(std::uint64_t hash) const;
     void AddExport(const GElf_Sym& symbol);
-    std::string_view Name(const GElf_Sym& symbol) const;
     void ReadRelocations(std::int64_t tableTag, std::int64_t sizeTag, bool withAddends);
+    void AddImport(std::uint32_t symbolIndex, bool atLoad);
+    bool BindsAtLoad() const;
     static Meaning MeaningOf(std::uint16_t machine, std::uint32_t type);
     std::optional<LoadedPointer> ToSymbol(const Relocation& relocation, std::uint64_t addend) const;
     std::uint64_t Wrapped(std::uint64_t address) const;
@@ -72,7 +85,10 @@ private:
     const ElfFile& file;
     std::string_view names;
     bool looksInItselfFirst = false;
+    Elf_Data* symbols = nullptr;   // of the file; null where there are none
+    std::vector<bool> isLookedUp;  // by the symbols' index
     std::vector<Symbol> exports;
+    std::vector<Import> imports;
     std::vector<Relocation> relocations;  // by address
 };
 

@@ -15,7 +15,7 @@ namespace vantor::analyze {
 struct Place {
     std::string path;
     int line = 0;    // 0: not known
-    int column = 0;  // in bytes; 0: not known
+    int column = 0;  // in characters; 0: not known
 };
 
 // A barrier's name in one of a plugin's lists.
@@ -68,6 +68,7 @@ struct Barrier {
 struct BootModel {
     std::vector<PluginDescription> plugins;
     std::map<std::string, Barrier> barriers;  // by the bytes of the name
+    std::vector<std::string> notLoaded;       // paths of plugin files that the boot rejects
 
     // Makes `barriers` anew from the plugins' lists.
     void LinkBarriers();

@@ -316,9 +316,20 @@ std::string PluginNameOf(const std::string& path) {
 
 void Explain(const BootModel& model, const Findings& findings, const std::string& name,
              std::ostream& stream, bool colour) {
-    if (!Explainer(model, stream, colour).Tell(name)) {
+    Explainer explainer(model, stream, colour);
+    if (explainer.Tell(name)) {
+        return;
+    }
+    const auto plugin = std::find_if(
+        model.plugins.begin(), model.plugins.end(), [&](const PluginDescription& candidate) {
+            const std::string& path = candidate.place.path;
+            return candidate.kind != PluginKind::Debug &&
+                   (path == name || path.substr(path.rfind('/') + 1) == name);
+        });
+    if (plugin == model.plugins.end()) {
         throw std::runtime_error(UnknownName(model, findings, name));
     }
+    explainer.Tell(plugin->name);
 }
 
 std::string UnknownName(const BootModel& model, const Findings& findings, const std::string& name) {

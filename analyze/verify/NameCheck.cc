@@ -1,5 +1,6 @@
 #include "verify/NameCheck.h"
 
+#include <algorithm>
 #include <map>
 #include <set>
 #include <string>
@@ -55,6 +56,31 @@ void Tell(const BootModel& model, const Plugins& plugins, Findings& findings) {
                                      : "")});
 }
 
+// A key is a name and a version with nothing between them.
+void CheckKeys(const BootModel& model, Findings& findings) {
+    std::map<std::string, Plugins> byKey;
+    for (std::size_t plugin = 0; plugin < model.plugins.size(); ++plugin) {
+        const PluginDescription& described = model.plugins[plugin];
+        if (described.runOnce) {
+            byKey[described.name + described.pluginVersion].push_back(plugin);
+        }
+    }
+    for (const auto& [key, plugins] : byKey) {
+        const PluginDescription& first = model.plugins[plugins.front()];
+        const bool severalNames =
+            std::any_of(plugins.begin(), plugins.end(), [&, &name = first.name](std::size_t other) {
+                return model.plugins[other].name != name;
+            });
+        if (severalNames) {
+            findings.push_back({Severity::Error, "shared-key", first.place,
+                                "the run-once plugins " + Enumerate(model, plugins) +
+                                    " have one key, \"" + key +
+                                    "\", in the record of those that have run: the boot runs only "
+                                    "the first that the directory lists"});
+        }
+    }
+}
+
 }  // namespace
 
 void CheckNames(const BootModel& model, Findings& findings) {
@@ -68,6 +94,7 @@ void CheckNames(const BootModel& model, Findings& findings) {
             Tell(model, distinct, findings);
         }
     }
+    CheckKeys(model, findings);
 }
 
 }  // namespace vantor::analyze

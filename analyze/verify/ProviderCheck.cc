@@ -54,6 +54,11 @@ Finding NoProvider(const BootModel& model, const std::string& name, const Barrie
     }
     if (!nearest.empty()) {
         text += "; did you mean " + QuotedBarrier(nearest) + "?";
+    } else if (model.notLoaded.size() == 1) {
+        text += "; " + model.notLoaded.front() + ", which the boot does not load, may provide it";
+    } else if (!model.notLoaded.empty()) {
+        text += "; one of the " + Counted(model.notLoaded.size(), "plugin file") +
+                " that the boot does not load may provide it";
     }
     return {matters ? Severity::Error : Severity::Note, "no-provider",
             PlaceOfRequirement(model, name, barrier), std::move(text)};

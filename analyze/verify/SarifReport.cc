@@ -80,7 +80,6 @@ void WriteSarif(const Findings& findings, std::ostream& stream, const char* vers
     driver["name"] = "vantor-analyze";
     driver["version"] = version;
     driver["rules"] = std::move(rules);
-    // Columns are counted in bytes, which are characters wherever the boot's files hold ASCII.
     run["columnKind"] = "unicodeCodePoints";
     run["results"] = std::move(results);
     Json report;

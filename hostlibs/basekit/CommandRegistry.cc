@@ -1,6 +1,7 @@
 #include "basekit/CommandRegistry.h"
 
 #include <algorithm>
+#include <utility>
 
 namespace BaseKit::impl {
 
@@ -40,7 +41,10 @@ void CommandRegistry::AddFiles(const std::vector<std::string>& names) {
     for (const std::string& name : names) {
         read.push_back(ReadDescriptionFile(name));
     }
+    Add(std::move(read));
+}
 
+void CommandRegistry::Add(std::vector<DescriptionFile> read) {
     std::vector<std::string> mistakes;
     {
         const std::lock_guard<std::mutex> guard(mutex);

@@ -21,6 +21,9 @@ public:
     // then throws DescriptionError with every mistake.
     void AddFiles(const std::vector<std::string>& names);
 
+    // The same for files that have been read.
+    void Add(std::vector<DescriptionFile> read);
+
     // Registers the commands of a file once more after a Reset. Throws DescriptionError when the
     // file is not known or a path is another file's by now.
     void Register(const std::string& name);

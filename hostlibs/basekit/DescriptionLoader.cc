@@ -11,6 +11,7 @@
 #include <memory>
 #include <optional>
 #include <string_view>
+#include <utility>
 
 #include "basekit/CommandReader.h"
 #include "basekit/Descriptor.h"
@@ -28,12 +29,6 @@ struct CloseDirectory {
 [[noreturn]] void ThrowUnreadable(const std::string& directory, int error) {
     throw AutoCli::DescriptionError(
         {directory + ": cannot read the directory: " + ErrnoText(error)});
-}
-
-bool IsDescriptionName(std::string_view name) {
-    constexpr std::string_view suffix = ".json";
-    return name.size() >= suffix.size() && name[0] != '.' &&
-           name.substr(name.size() - suffix.size()) == suffix;
 }
 
 // O_NONBLOCK: a FIFO of such a name must not stop the boot.
@@ -66,12 +61,17 @@ std::optional<std::string> ReadWholeFile(const std::string& name, Mistakes& mist
 }  // namespace
 
 DescriptionFile ReadDescriptionFile(const std::string& name) {
-    DescriptionFile file{name, {}, Mistakes(name)};
-    const std::optional<std::string> text = ReadWholeFile(name, file.mistakes);
+    Mistakes mistakes(name);
+    const std::optional<std::string> text = ReadWholeFile(name, mistakes);
     if (!text.has_value()) {
-        return file;
+        return {name, {}, std::move(mistakes)};
     }
-    const std::optional<Json> document = ParseJson(*text, file.mistakes);
+    return ParseDescriptionFile(name, *text);
+}
+
+DescriptionFile ParseDescriptionFile(const std::string& name, const std::string& text) {
+    DescriptionFile file{name, {}, Mistakes(name)};
+    const std::optional<Json> document = ParseJson(text, file.mistakes);
     if (!document.has_value()) {
         return file;
     }
@@ -89,6 +89,12 @@ DescriptionFile ReadDescriptionFile(const std::string& name) {
         }
     }
     return file;
+}
+
+bool IsDescriptionName(std::string_view name) {
+    constexpr std::string_view suffix = ".json";
+    return name.size() >= suffix.size() && name[0] != '.' &&
+           name.substr(name.size() - suffix.size()) == suffix;
 }
 
 std::vector<std::string> ListDescriptionFiles(const std::string& directory) {

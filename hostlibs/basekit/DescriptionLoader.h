@@ -2,6 +2,7 @@
 #define VANTOR_BASEKIT_DESCRIPTIONLOADER_H
 
 #include <string>
+#include <string_view>
 #include <vector>
 
 #include "basekit/CommandDescription.h"
@@ -24,9 +25,15 @@ struct DescriptionFile {
 
 DescriptionFile ReadDescriptionFile(const std::string& name);
 
-// The paths of a directory's description files in the order in which they are read: those of its
-// entries that match "*.json" as a shell would read it, by the bytes of their names. Throws
-// DescriptionError when the directory cannot be read.
+// The same for a file whose text has been read already.
+DescriptionFile ParseDescriptionFile(const std::string& name, const std::string& text);
+
+// Whether a directory's entry of that name is a description file: those that match "*.json" as a
+// shell would read it.
+bool IsDescriptionName(std::string_view name);
+
+// The paths of a directory's description files in the order in which they are read: by the bytes of
+// their names. Throws DescriptionError when the directory cannot be read.
 std::vector<std::string> ListDescriptionFiles(const std::string& directory);
 
 }  // namespace BaseKit::impl

@@ -2,6 +2,7 @@
 
 import json
 import os
+import re
 import struct
 import subprocess
 
@@ -17,13 +18,19 @@ from test_json_rejections import FAULTS, LENIENT, cases, changed, nested
 
 LOADING = "exception occurred whilst loading plugin "
 REJECTIONS = {"rejected", "truncated", "foreign-architecture", "unsupported-version",
-              "deep-nesting"}
+              "deep-nesting", "missing-library", "missing-version", "undefined-symbol"}
 # Behind the boot's words these say in parentheses what those leave out.
 EXPLAINED = {"foreign-architecture", "deep-nesting"}
 OF_VERSION = OPERATIONS_ALONE.replace("{", "{{").replace("}", "}}") + """
 VANTOR_EXPORTED_ const struct vantor_metadata_1 metadata;
 const struct vantor_metadata_1 metadata = {{ {version}, NULL, NULL }};
 """
+NEEDY = OPERATIONS_ALONE + "VANTOR_METADATA_1(NULL, NULL);\n"
+DATA_OF_NOBODY = NEEDY + "extern int nowhere; int *found = &nowhere;\n"
+CALL_OF_NOBODY = NEEDY.replace("return 0;", "return nowhere();").replace(
+    "VANTOR_METHOD", "int nowhere(void);\nVANTOR_METHOD", 1)
+WEAK_CALL_OF_NOBODY = CALL_OF_NOBODY.replace("return nowhere();", "return nowhere ? 1 : 0;").replace(
+    "int nowhere", "__attribute__((weak)) int nowhere", 1)
 # Offsets of fields of an ELF header, by the size of a word.
 TYPE, MACHINE, VERSION = 16, 18, 20
 SEGMENTS = {4: 28, 8: 32}
@@ -113,6 +120,95 @@ def test_every_bad_object(root, vantor):
     for number, content in enumerate(contents):
         root.write(f"{PLUGINS}/lib{number}.so", content, 0o755)
     assert_foretold(root, vantor, len(contents))
+
+
+def test_every_object_that_needs_what_the_host_lacks(root, vantor):
+    good = PluginFactory.stamped(["name x"])
+    contents = [
+        good.replace(b"libc.so.6\0", b"libc.so.0\0"),
+        re.sub(rb"GLIBC_2\.", b"GLIBC_9.", good),
+        PluginFactory.compile(DATA_OF_NOBODY, "c"),
+        PluginFactory.compile(CALL_OF_NOBODY, "c", "-Wl,-z,now"),
+    ]
+    for number, content in enumerate(contents):
+        root.write(f"{PLUGINS}/lib{number}.so", content, 0o755)
+    codes = sorted(finding["code"] for finding in verify(root) if finding["code"] in REJECTIONS)
+    assert codes == ["missing-library", "missing-version", "undefined-symbol", "undefined-symbol"]
+    assert_foretold(root, vantor, len(contents))
+
+
+def test_a_library_of_a_plugins_own(root, vantor):
+    root.compiled("x", NEEDY, "c", "-Wl,--no-as-needed", "-Wl,-rpath,/opt/own",
+                  own_library(root, "libmine.so", "int mine;"))
+    assert told_of_links(root) == []
+    assert vantor().texts(WARNING) == []
+    root.remove("/opt/own")
+    assert_foretold(root, vantor, 1)
+
+
+def own_library(root, name, text):
+    """Compiles a library into /opt/own, and returns its path for linking."""
+    root.write(f"/opt/own/{name}", PluginFactory.compile(text, "c", f"-Wl,-soname,{name}"))
+    return root.path(f"/opt/own/{name}")
+
+
+def told_of_links(root):
+    return [finding for finding in verify(root) if finding["code"] in
+            ("missing-library", "missing-version", "undefined-symbol", "load-order",
+             "unchecked-objects", "taken-over")]
+
+
+def test_a_call_of_nobodys_function_ends_the_boot(root, vantor):
+    root.compiled("x", CALL_OF_NOBODY)
+    [finding] = told_of_links(root)
+    assert (finding["severity"], finding["code"], finding["text"]) == (
+        "error", "undefined-symbol",
+        'no object defines "nowhere", which it calls: the linker ends the boot at the call')
+    result = vantor()
+    assert result.status == 127
+    assert "undefined symbol: nowhere" in result.stderr
+
+
+def test_a_function_that_need_not_be_there(root, vantor):
+    root.compiled("x", WEAK_CALL_OF_NOBODY)
+    assert told_of_links(root) == []
+    assert vantor().status == 0
+
+
+def test_a_variable_of_each_thread_is_found(root, vantor):
+    text = NEEDY.replace("return 0;", "return mine - 1;").replace(
+        "VANTOR_METHOD", "extern __thread int mine;\nVANTOR_METHOD", 1)
+    root.compiled("x", text, "c", "-Wl,-rpath,/opt/own",
+                  own_library(root, "libmine.so", "__thread int mine = 1;"))
+    assert told_of_links(root) == []
+    assert vantor().texts(WARNING) == []
+
+
+def test_another_plugins_function_is_found_when_it_is_called(root, vantor):
+    root.compiled("x", CALL_OF_NOBODY)
+    root.compiled("y", NEEDY + "VANTOR_EXPORTED_ int nowhere(void);\n"
+                  "int nowhere(void) { return 0; }\n")
+    assert told_of_links(root) == []
+    assert vantor().status == 0
+
+
+def test_an_entry_under_a_name_of_the_c_library_is_not_the_plugins(root, vantor):
+    root.compiled("x", """#include <stdio.h>
+#include "vantor/plugin.h"
+int getpagesize(void);
+__attribute__((visibility("default"))) int getpagesize(void) { puts("own"); return 0; }
+struct entries { int (*start)(void); };
+VANTOR_EXPORTED_ struct entries operations;
+struct entries operations = { getpagesize };
+VANTOR_METADATA_1(NULL, NULL);
+""")
+    [finding] = told_of_links(root)
+    assert (finding["severity"], finding["code"]) == ("error", "taken-over")
+    assert re.fullmatch(
+        r'the start entry is looked up by its exported name "getpagesize", which is exported by '
+        r"/\S*/libc\.so\.6 too, which the boot program has loaded before: it serves this plugin",
+        finding["text"]), finding
+    assert "own" not in vantor().stdout
 
 
 @pytest.mark.parametrize("extension", ["so", "json"])

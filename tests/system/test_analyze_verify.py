@@ -188,6 +188,13 @@ def test_a_directory_that_cannot_be_read(root):
     assert result.stderr == f"vantor-analyze: {root.folder}/nowhere: No such file or directory\n"
 
 
+def test_a_directory_of_a_host_in_a_folder_is_a_path_of_that_host(root):
+    result = analyze(root, "verify", "usr/libexec")
+    assert (result.status, result.stdout, result.stderr) == (
+        3, "", "vantor-analyze: usr/libexec: the directory of a host in a folder begins with "
+        "\"/\"\n")
+
+
 def test_a_root_without_a_name_is_refused(root):
     result = run_analyze(root, "verify", "--root=")
     assert (result.status, result.stdout) == (3, "")
@@ -218,6 +225,42 @@ def test_a_result_that_cannot_be_written(root):
         result = run_analyze(root, "verify", "--root", root.folder, stdout=full)
     assert (result.status, result.stderr) == (
         3, "vantor-analyze: the result could not be written\n")
+
+
+@pytest.mark.parametrize("arguments", [["--help"], ["--version"], ["verify", "--help"]])
+def test_help_that_cannot_be_written(root, arguments):
+    if not os.path.exists("/dev/full"):
+        pytest.skip("there is no /dev/full here")
+    with open("/dev/full", "wb", buffering=0) as full:
+        result = run_analyze(root, *arguments, stdout=full)
+    assert (result.status, result.stderr) == (
+        3, "vantor-analyze: the result could not be written\n")
+
+
+def test_run_once_plugins_of_several_names_with_one_key(root):
+    json_plugin.make_directories(root)
+    for name, version in (("a", "b1"), ("ab", "1"), ("abc", "1")):
+        json_plugin.write_plugin(root, name, run_once=True, plugin_version=version)
+    result = analyze(root, "verify")
+    assert (result.status, result.stdout) == (
+        2, f"{PLUGINS}/a.json: error[shared-key]: the run-once plugins 'a' and 'ab' have one key, "
+        "\"ab1\", in the record of those that have run: the boot runs only the first that the "
+        "directory lists\n")
+
+
+@pytest.mark.parametrize("rejected, hint", [
+    (["x"], f"{PLUGINS}/x.json, which the boot does not load, may provide it"),
+    (["x", "y"], "one of the 2 plugin files that the boot does not load may provide it"),
+])
+def test_a_rejected_file_may_be_the_provider_that_is_missing(root, rejected, hint):
+    json_plugin.make_directories(root)
+    json_plugin.write_plugin(root, "user", requires=["disks"])
+    for name in rejected:
+        root.write(f"{PLUGINS}/{name}.json", "[]")
+    [missing] = [one for one in findings_of(analyze(root, "verify", "--format=json"))
+                 if one["code"] == "no-provider"]
+    assert missing["text"] == (
+        f"no plugin provides barrier \"disks\", required by 'user'; {hint}")
 
 
 def test_help_and_version(root):

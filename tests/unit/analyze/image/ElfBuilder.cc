@@ -13,7 +13,7 @@ const Architecture armWith64Bits{ELFCLASS64, ELFDATA2LSB, EM_AARCH64};
 
 namespace {
 
-constexpr std::uint64_t base = 0x20000;  // the address of the file's first byte
+constexpr std::uint64_t loadAddress = 0x20000;  // the address of the file's first byte
 constexpr std::uint64_t tailAddress = 0x100000;
 constexpr std::uint64_t pageSize = 4096;
 constexpr std::size_t segmentCount = 3;
@@ -80,7 +80,7 @@ void ElfBuilder::AppendWord(std::string& file, std::uint64_t value) const {
 
 std::uint64_t ElfBuilder::Bytes(const std::string& bytes) {
     content += bytes;
-    return base + content.size() - bytes.size();
+    return loadAddress + content.size() - bytes.size();
 }
 
 std::string ElfBuilder::Encode(const std::vector<Word>& words, std::uint64_t address) {
@@ -96,7 +96,7 @@ std::string ElfBuilder::Encode(const std::vector<Word>& words, std::uint64_t add
 }
 
 std::uint64_t ElfBuilder::Words(const std::vector<Word>& words) {
-    const std::uint64_t address = base + Align();
+    const std::uint64_t address = loadAddress + Align();
     content += Encode(words, address);
     return address;
 }
@@ -219,8 +219,8 @@ void ElfBuilder::PutHeaders(std::string& file, std::uint64_t dynamicOffset,
         }
         put(pageSize, word);
     };
-    segment(PT_LOAD, 0, base, end);
-    segment(PT_DYNAMIC, dynamicOffset, base + dynamicOffset, end - dynamicOffset);
+    segment(PT_LOAD, 0, loadAddress, end);
+    segment(PT_DYNAMIC, dynamicOffset, loadAddress + dynamicOffset, end - dynamicOffset);
     segment(tail.empty() ? PT_NULL : PT_LOAD, file.size() - tail.size(), tailAddress, tail.size());
 }
 
@@ -230,11 +230,15 @@ std::string ElfBuilder::Finish() const {
     const auto append = [&file](const std::string& table) {
         file.resize((file.size() + 7) / 8 * 8);
         file += table;
-        return base + file.size() - table.size();
+        return loadAddress + file.size() - table.size();
     };
     const std::string relocationTable = RelocationTable();
     std::vector<Entry> entries = dynamic;
     entries.push_back({DT_SYMTAB, append(SymbolTable(names))});
+    for (const TextEntry& entry : dynamicTexts) {
+        entries.push_back({entry.tag, names.size()});
+        names += entry.text + '\0';
+    }
     entries.push_back({DT_STRTAB, append(names)});
     entries.push_back({DT_STRSZ, names.size()});
     entries.push_back({DT_HASH, append(HashTable())});
@@ -250,7 +254,7 @@ std::string ElfBuilder::Finish() const {
         AppendWord(section, entry.tag);
         AppendWord(section, entry.value);
     }
-    const std::uint64_t dynamicOffset = append(section) - base;
+    const std::uint64_t dynamicOffset = append(section) - loadAddress;
     const std::uint64_t end = file.size();
     if (!tail.empty()) {
         file.resize(static_cast<std::size_t>((end + pageSize - 1) / pageSize * pageSize));

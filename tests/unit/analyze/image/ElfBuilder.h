@@ -53,6 +53,11 @@ public:
     // A further entry of the dynamic section.
     void AddDynamic(std::uint64_t tag, std::uint64_t value) { dynamic.push_back({tag, value}); }
 
+    // The same for one whose value is a text: DT_NEEDED, DT_SONAME, ...
+    void AddDynamic(std::uint64_t tag, const std::string& text) {
+        dynamicTexts.push_back({tag, text});
+    }
+
     // The whole file.
     std::string Finish() const;
 
@@ -86,7 +91,12 @@ private:
     std::string tail;
     std::vector<Relocation> relocations;
     std::vector<Symbol> symbols;
+    struct TextEntry {
+        std::uint64_t tag;
+        std::string text;
+    };
     std::vector<Entry> dynamic;
+    std::vector<TextEntry> dynamicTexts;
 };
 
 // A plugin's two records in a builder; what is not set is null.

@@ -5,6 +5,7 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
+#include "analyze/image/ElfBuilder.h"
 #include "analyze/image/HostFixture.h"
 #include "image/CommandDescriptions.h"
 #include "image/DebugDescription.h"
@@ -78,6 +79,8 @@ TEST_F(DebugDescriptionTest, AnEntryThatAMarkerBringsTooRunsTwice) {
 
 class CommandDescriptionsTest : public support::HostFixture {
 protected:
+    CommandDescriptionsTest() { chmod(folder.Path().c_str(), 0755); }
+
     void Describe() const {
         Write("/usr/lib/nuvex/nvcli/int/ext/system.json",
               R"({"commands": [{"path": "system folder create", "summary": "s",
@@ -86,7 +89,9 @@ protected:
                   "execute": ["/bin/mkdir", "${path}"]}]})");
     }
     std::vector<std::string> Check(const std::string& text) {
-        CommandDescriptions(image, findings).Check({text, {"/p/x.json", 3, 5}}, findings);
+        Ownership ownership(image);
+        CommandDescriptions(image, ownership, findings)
+            .Check({text, {"/p/x.json", 3, 5}}, findings);
         return Found();
     }
 };
@@ -120,20 +125,52 @@ TEST_F(CommandDescriptionsTest, ACommandLineThatCannotBeParsedIsTold) {
     EXPECT_EQ(found[0].rfind("/p/x.json:3 warning bad-command: \"system 'open\": ", 0), 0U);
 }
 
-TEST_F(CommandDescriptionsTest, WithoutDescriptionsNobodyKnowsBetter) {
+TEST_F(CommandDescriptionsTest, ThatThereAreNoDescriptionsIsToldOnceAndNotOfEachCommand) {
     EXPECT_THAT(Check("system folder creat"), IsEmpty());
+    BootModel model;
+    Ownership ownership(image);
+    const CommandDescriptions none(image, ownership, findings);
+    none.CheckFolders(model, findings);
+    EXPECT_THAT(Found(), IsEmpty()) << "nobody has a command";
+    model.plugins.emplace_back().commands = {{"a", {}}, {"b", {}}};
+    none.CheckFolders(model, findings);
+    EXPECT_THAT(Found(), ElementsAre("/usr/lib/nuvex/nvcli:0 warning no-descriptions: there are "
+                                     "no command descriptions here: no command of a JSON plugin "
+                                     "is known"));
 }
 
 TEST_F(CommandDescriptionsTest, ABadDescriptionIsToldByItsPathOnTheHost) {
     Write("/usr/lib/nuvex/nvcli/x.json", "{}");
-    CommandDescriptions(image, findings).Check({"", {}}, findings);
-    const std::vector<std::string> found = Found();
-    ASSERT_EQ(found.size(), 1U);
-    EXPECT_EQ(found[0].rfind("/usr/lib/nuvex/nvcli:0 warning bad-description: "
-                             "/usr/lib/nuvex/nvcli/x.json: ",
-                             0),
-              0U)
-        << found[0];
+    Write("/usr/lib/nuvex/nvcli/ext/y.json", "{\"commands\": []");
+    ASSERT_EQ(symlink("nowhere", folder.File("usr/lib/nuvex/nvcli/z.json").c_str()), 0);
+    Check("");
+    const std::vector<std::string> found = Found("bad-description");
+    ASSERT_EQ(found.size(), 3U);
+    EXPECT_EQ(found[0], "/usr/lib/nuvex/nvcli/x.json:0 warning bad-description: the key "
+                        "\"commands\" is missing");
+    EXPECT_EQ(found[1], "/usr/lib/nuvex/nvcli/z.json:0 warning bad-description: cannot read the "
+                        "file: No such file or directory");
+    EXPECT_EQ(found[2].rfind("/usr/lib/nuvex/nvcli/ext/y.json:0 warning bad-description: ", 0), 0U)
+        << found[2];
+}
+
+TEST_F(CommandDescriptionsTest, DescriptionsAreReadWhereTheirLinksLeadOnTheHost) {
+    Describe();
+    boost::filesystem::rename(folder.Path() + "/usr/lib/nuvex/nvcli", folder.Path() + "/moved");
+    ASSERT_EQ(symlink("/moved", folder.File("usr/lib/nuvex/nvcli").c_str()), 0);
+    EXPECT_THAT(Check("system folder create --path=/a"), IsEmpty());
+    EXPECT_EQ(Check("system folder creat").size(), 1U);
+}
+
+TEST_F(CommandDescriptionsTest, DescriptionsThatOthersMayWriteAreTold) {
+    Write("/usr/lib/nuvex/nvcli/x.json", "{\"commands\": []}");
+    chmod(folder.File("usr/lib/nuvex/nvcli/x.json").c_str(), 0666);
+    Check("");
+    EXPECT_EQ(Found("writable"),
+              std::vector<std::string>{
+                  "/usr/lib/nuvex/nvcli/x.json:0 warning writable: can be written by others than "
+                  "root: its group, " +
+                  std::to_string(getegid()) + ", everybody (mode 0666)"});
 }
 
 class OwnershipTest : public support::HostFixture {
@@ -215,6 +252,7 @@ protected:
     }
 
     SharedNames names;
+    const LinkScope scope{image, support::x86};  // of a host without a boot program
 };
 
 TEST_F(SharedNamesTest, AnEntryThatAnotherExportsTooIsToldOfEachThatLooksItUp) {
@@ -222,7 +260,7 @@ TEST_F(SharedNamesTest, AnEntryThatAnotherExportsTooIsToldOfEachThatLooksItUp) {
     Add("b.so", {}, {"metadata", "start"});
     Add("c.so", {{"the start entry", "begin"}}, {"begin"});
     Add("d.so", {{"the start entry", "start"}}, {"start"});
-    names.Report(findings);
+    names.Report(scope, findings);
     EXPECT_THAT(Found(),
                 ElementsAre("a.so:0 error taken-over: the start entry is looked up by its "
                             "exported name \"start\", which is exported by b.so, d.so too: "
@@ -237,10 +275,18 @@ TEST_F(SharedNamesTest, OfManyThreeAreNamed) {
         Add(path, {}, {"start"});
     }
     Add("x", {{"the start entry", "start"}}, {"start"});
-    names.Report(findings);
+    names.Report(scope, findings);
     EXPECT_THAT(Found(), ElementsAre("x:0 error taken-over: the start entry is looked up by its "
                                      "exported name \"start\", which is exported by a, b, c and "
                                      "3 more too: whichever is loaded first serves all of them"));
+}
+
+TEST_F(SharedNamesTest, APluginThatIsNotKeptTakesNothingOver) {
+    Add("a.so", {{"the start entry", "start"}}, {"start"});
+    Add("b.so", {}, {"start"});
+    names.Forget({"b.so"});
+    names.Report(scope, findings);
+    EXPECT_THAT(Found(), IsEmpty());
 }
 
 }  // namespace

@@ -1,0 +1,126 @@
+// Where the dynamic linker of a host looks for libraries.
+
+#include "image/LibrarySearch.h"
+
+#include <elf.h>
+#include <gmock/gmock.h>
+
+#include "analyze/image/ElfBuilder.h"
+#include "analyze/image/HostFixture.h"
+
+namespace vantor::analyze {
+
+namespace {
+
+using support::ElfBuilder;
+using ::testing::ElementsAre;
+using ::testing::IsEmpty;
+
+// A cache as ldconfig(8) writes it: pairs of a name and a path.
+std::string CacheOf(const std::vector<std::pair<std::string, std::string>>& entries,
+                    std::uint64_t processor = 0) {
+    std::string cache = "glibc-ld.so.cache1.1";
+    cache.resize(48 + 24 * entries.size());
+    ElfBuilder::Put(cache, 20, entries.size(), 4);
+    std::size_t entry = 48;
+    for (const auto& [name, path] : entries) {
+        ElfBuilder::Put(cache, entry + 4, cache.size(), 4);
+        cache += name + '\0';
+        ElfBuilder::Put(cache, entry + 8, cache.size(), 4);
+        cache += path + '\0';
+        ElfBuilder::Put(cache, entry + 16, processor, 8);
+        entry += 24;
+    }
+    return cache;
+}
+
+class LibrarySearchTest : public support::HostFixture {
+protected:
+    void WriteLibrary(const std::string& path, const Architecture& kind = support::x86) const {
+        Write(path, ElfBuilder(kind).Finish());
+    }
+    std::string Find(const std::string& name) const {
+        return LibrarySearch(image, support::x86).Find(name, "/opt/p/x.so", linkage);
+    }
+
+    Linkage linkage;
+};
+
+TEST_F(LibrarySearchTest, ALibraryThatIsNowhereIsNotFound) { EXPECT_EQ(Find("libx.so"), ""); }
+
+TEST_F(LibrarySearchTest, TheCacheComesBeforeTheDefaultFolders) {
+    WriteLibrary("/usr/lib/libx.so");
+    EXPECT_EQ(Find("libx.so"), "/usr/lib/libx.so");
+    WriteLibrary("/lib/i386-linux-gnu/libx.so");
+    EXPECT_EQ(Find("libx.so"), "/lib/i386-linux-gnu/libx.so");
+    WriteLibrary("/opt/lib/libx.so");
+    Write(LinkerCache::path, CacheOf({{"liby.so", "/y"}, {"libx.so", "/opt/lib/libx.so"}}));
+    EXPECT_EQ(Find("libx.so"), "/opt/lib/libx.so");
+}
+
+TEST_F(LibrarySearchTest, LibrariesOfOtherArchitecturesArePassedOver) {
+    WriteLibrary("/a/libx.so", support::x86With64Bits);
+    WriteLibrary("/b/libx.so");
+    Write(LinkerCache::path, CacheOf({{"libx.so", "/a/libx.so"}, {"libx.so", "/b/libx.so"}}));
+    EXPECT_EQ(Find("libx.so"), "/b/libx.so");
+}
+
+TEST_F(LibrarySearchTest, AnObjectsOwnFoldersComeFirst) {
+    WriteLibrary("/usr/lib/libx.so");
+    WriteLibrary("/opt/p/lib/libx.so");
+    linkage.runPath = "/none::$ORIGIN/lib";
+    EXPECT_EQ(Find("libx.so"), "/opt/p/lib/libx.so");
+    linkage.runPath = "${ORIGIN}/../p/$LIB";
+    WriteLibrary("/opt/p/lib/i386-linux-gnu/libx.so");
+    EXPECT_EQ(Find("libx.so"), "/opt/p/../p/lib/i386-linux-gnu/libx.so");
+}
+
+TEST_F(LibrarySearchTest, TheProgramsFoldersHoldWhereAnObjectNamesNone) {
+    WriteLibrary("/usr/lib/libx.so");
+    WriteLibrary("/program/libx.so");
+    LibrarySearch search(image, support::x86);
+    search.SetInheritedPath("/program");
+    EXPECT_EQ(search.Find("libx.so", "/x.so", linkage), "/program/libx.so");
+    linkage.runPath = "/none";
+    EXPECT_EQ(search.Find("libx.so", "/x.so", linkage), "/usr/lib/libx.so");
+}
+
+TEST_F(LibrarySearchTest, AnObjectMayForbidTheDefaultFolders) {
+    WriteLibrary("/usr/lib/libx.so");
+    linkage.searchesDefaultFolders = false;
+    EXPECT_EQ(Find("libx.so"), "");
+}
+
+TEST_F(LibrarySearchTest, APathIsTakenAsItIs) {
+    WriteLibrary("/opt/libx.so");
+    EXPECT_EQ(Find("/opt/libx.so"), "/opt/libx.so");
+    EXPECT_EQ(Find("/opt/liby.so"), "");
+}
+
+TEST(LinkerCacheTest, EntriesKeepTheirOrder) {
+    const LinkerCache cache(CacheOf({{"x", "/2"}, {"y", "/3"}, {"x", "/1"}}), ELFDATA2LSB);
+    EXPECT_THAT(cache.Find("x"), ElementsAre("/2", "/1"));
+    EXPECT_THAT(cache.Find("z"), IsEmpty());
+}
+
+TEST(LinkerCacheTest, EntriesForSingleProcessorsAreLeftOut) {
+    EXPECT_THAT(LinkerCache(CacheOf({{"x", "/1"}}, 1ULL << 62U), ELFDATA2LSB).Find("x"), IsEmpty());
+}
+
+TEST(LinkerCacheTest, EveryTruncatedCacheIsReadAsFarAsItGoes) {
+    const std::string whole = CacheOf({{"x", "/1"}, {"y", "/2"}});
+    for (std::size_t size = 0; size < whole.size(); ++size) {
+        const LinkerCache cache(whole.substr(0, size), ELFDATA2LSB);
+        EXPECT_THAT(cache.Find("y"), ::testing::AnyOf(IsEmpty(), ElementsAre("")));
+    }
+}
+
+TEST(LinkerCacheTest, ACountBeyondTheFileEndsWithTheFile) {
+    std::string cache = CacheOf({{"x", "/1"}});
+    ElfBuilder::Put(cache, 20, 0xffffffffU, 4);
+    EXPECT_THAT(LinkerCache(cache, ELFDATA2LSB).Find("x"), ElementsAre("/1"));
+}
+
+}  // namespace
+
+}  // namespace vantor::analyze
