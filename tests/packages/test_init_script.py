@@ -22,8 +22,9 @@ class Script:
         self.install_program("printf '<%s>' \"$@\"")
         with open(os.path.join(source, "packaging", "vantor.init"), encoding="utf-8") as file:
             text = file.read()
+        self.analyzer = f"{folder}/analyzer"
         for name, path in [("PROGRAM", self.program), ("DEFAULTS", self.defaults),
-                           ("RECORD", self.record)]:
+                           ("RECORD", self.record), ("ANALYZER", self.analyzer)]:
             text, count = re.subn(rf"(?m)^{name}=.*$", f"{name}='{path}'", text)
             assert count == 1, f"the script sets {name} {count} times"
         self.path = f"{folder}/script"
@@ -37,6 +38,9 @@ class Script:
 
     def install_program(self, *lines):
         self._write(self.program, "#!/bin/sh\n" + "\n".join(lines) + "\n")
+
+    def install_analyzer(self, *lines):
+        self._write(self.analyzer, "#!/bin/sh\n" + "\n".join(lines) + "\n")
 
     def set_defaults(self, text):
         self._write(self.defaults, text, 0o644)
@@ -238,6 +242,29 @@ def test_status_while_a_boot_is_under_way(script):
         finally:
             running.kill()
     assert (done.returncode, done.stdout) == (0, "vantor is booting the host\n")
+
+
+def test_verify_filters_as_the_next_boot_does(script):
+    script.install_analyzer("printf '<%s>' \"$@\"", "exit 2")
+    script.set_defaults("VANTOR_PARALLEL=yes\nVANTOR_PLUGIN_FLAGS='a,b c'\nVANTOR_OPTIONS='\n"
+                        "--trace\n--disable-plugins=x y,*\n--plugin-flags=last\n'\n")
+    done = script.call("verify")
+    assert (re.findall(r"<([^>]*)>", done.stdout), done.stderr, done.returncode) == (
+        ["verify", "--plugin-flags=a,b c", "--run-once=identity1.2,setup3,",
+         "--disable-plugins=x y,*", "--plugin-flags=last"], "", 2)
+
+
+def test_verify_says_nothing_of_settings_that_only_a_boot_needs(script):
+    script.install_analyzer("printf '<%s>' \"$@\"")
+    os.remove(script.record)
+    script.set_defaults("VANTOR_PARALLEL=perhaps\n")
+    done = script.call("verify")
+    assert (done.stdout, done.stderr, done.returncode) == ("<verify>", "", 0)
+
+
+def test_verify_without_the_analyzer_does_nothing(script):
+    done = script.call("verify")
+    assert (done.stdout, done.stderr, done.returncode) == ("", "", 0)
 
 
 def test_a_script_that_a_removed_package_left_does_nothing(script):

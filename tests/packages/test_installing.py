@@ -99,6 +99,15 @@ def test_removing_the_plugin_at_fault_leaves_nothing_to_tell(host, tmp_path):
     assert host.state_of("vantor") == "installed"
 
 
+def test_a_plugin_is_checked_as_the_next_boot_filters_it(host, tmp_path):
+    host.write("/etc/default/vantor", "VANTOR_OPTIONS='\n--disable-plugins=vault\n'\n")
+    plugin = make_deb(tmp_path, "a-plugin", {"/usr/libexec/vantor/plugins/vault.json": PLUGIN})
+    done = host.dpkg_install(plugin)
+    assert done.returncode == 0, done.stdout + done.stderr
+    assert "error[no-provider]" not in done.stdout
+    assert "note[no-provider]" in done.stdout
+
+
 def test_a_check_that_cannot_be_run_stops_no_installation(host, tmp_path):
     host.script("/usr/sbin/vantor-analyze", "echo broken; exit 127")
     plugin = make_deb(tmp_path, "a-plugin", {"/usr/libexec/vantor/plugins/vault.json": PLUGIN})
