@@ -1,6 +1,6 @@
 #include <iostream>
 
-#include "CommandLine.h"
+#include "verbs/CommandLine.h"
 
 int main(int argc, char** argv) {
     vantor::analyze::Invocation invocation = vantor::analyze::OnTerminal(std::cout, std::cerr);

@@ -4,10 +4,12 @@
 #include <cerrno>
 #include <charconv>
 #include <cstring>
-#include <fstream>
 #include <limits>
+#include <sstream>
 #include <string_view>
 #include <utility>
+
+#include "boot/InputText.h"
 
 namespace vantor::analyze {
 
@@ -236,11 +238,7 @@ BootLog ParseBootLog(std::istream& stream, const std::string& path) {
 }
 
 BootLog ReadBootLog(const std::string& path) {
-    errno = 0;
-    std::ifstream stream(path);
-    if (!stream) {
-        throw std::runtime_error(path + ": cannot be opened: " + std::strerror(errno));
-    }
+    std::istringstream stream(ReadInput(path));
     return ParseBootLog(stream, path);
 }
 

@@ -4,12 +4,14 @@
 #include <charconv>
 #include <cstdint>
 #include <cstring>
-#include <fstream>
 #include <map>
+#include <sstream>
 #include <stdexcept>
 #include <string_view>
 #include <utility>
 #include <vector>
+
+#include "boot/InputText.h"
 
 namespace vantor::analyze {
 
@@ -18,7 +20,7 @@ namespace {
 constexpr std::string_view labelStart = " [label=\"";
 constexpr std::string_view labelEnd = "\"];";
 constexpr std::string_view barrierEnd = "\" shape=box];";
-constexpr std::string_view arrow = " -> ";
+constexpr std::string_view edgeArrow = " -> ";
 
 bool EndsWith(std::string_view text, std::string_view end) {
     return text.size() >= end.size() && text.substr(text.size() - end.size()) == end;
@@ -74,8 +76,8 @@ private:
             closed = true;
         } else {
             const std::uint64_t id = TakeId(line);
-            if (line.substr(0, arrow.size()) == arrow) {
-                line.remove_prefix(arrow.size());
+            if (line.substr(0, edgeArrow.size()) == edgeArrow) {
+                line.remove_prefix(edgeArrow.size());
                 edges.push_back({id, TakeId(line)});
                 if (line != ";") {
                     Fail("expected \";\" and the end of the line after the edge");
@@ -158,11 +160,7 @@ BootModel ParseDotModel(std::istream& stream, const std::string& path) {
 }
 
 BootModel ReadDotModel(const std::string& path) {
-    errno = 0;
-    std::ifstream stream(path);
-    if (!stream) {
-        throw std::runtime_error(path + ": cannot be opened: " + std::strerror(errno));
-    }
+    std::istringstream stream(ReadInput(path));
     return ParseDotModel(stream, path);
 }
 

@@ -18,10 +18,10 @@ namespace vantor::analyze {
 namespace {
 
 // Stands for a plugin or a barrier. What it does takes place on the virtual clock alone.
-class SimulatedNode : public Node {
+class SimulatedNode : public vantor::Node {
 public:
     SimulatedNode(const std::string& nodeName, Microseconds length, std::size_t place)
-        : Node(nodeName), run(length), entry(place) {}
+        : vantor::Node(nodeName), run(length), entry(place) {}
 
     void Run() override {}
     std::string DotAttributes() const override { return ""; }

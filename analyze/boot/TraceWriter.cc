@@ -14,7 +14,6 @@ namespace {
 using Json = nlohmann::ordered_json;
 
 constexpr int process = 1;
-constexpr std::size_t none = TimelineEntry::none;
 
 class TraceWriter {
 public:
@@ -69,7 +68,7 @@ private:
         const Release& release = releases[index];
         Json details{{"waited for barriers (us)", entry.WaitedForBarriers()},
                      {"waited for a worker (us)", entry.WaitedForWorker()}};
-        if (release.by != none) {
+        if (release.by != TimelineEntry::none) {
             details["released by"] = timeline.entries[release.by].name;
             if (release.cause == ReleaseCause::Barrier) {
                 details["through barrier"] = entry.releasedThrough;
@@ -88,7 +87,7 @@ private:
     // An arrow begins and ends inside of slices: hence a microsecond before the end of the one.
     void WriteArrow(std::size_t index) {
         const Release& release = releases[index];
-        if (release.by == none) {
+        if (release.by == TimelineEntry::none) {
             return;
         }
         const TimelineEntry& from = timeline.entries[release.by];

@@ -11,7 +11,7 @@ namespace vantor::analyze {
 
 namespace {
 
-constexpr std::size_t ticks = 11;
+constexpr std::size_t axisTicks = 11;
 constexpr double figuresWidth = 84;
 
 std::vector<bool> Marked(const std::vector<ChainLink>& chain, std::size_t entries) {
@@ -77,14 +77,14 @@ std::vector<std::string> ChartFrame::Tooltip(std::size_t index) const {
 
 void DrawGrid(SvgText& svg, const TimeAxis& axis, double top, double bottom) {
     std::string lines;
-    for (const Tick& tick : axis.Ticks(ticks)) {
+    for (const Tick& tick : axis.Ticks(axisTicks)) {
         lines += fmt::format("M{} {}V{}", Coordinate(tick.x), Coordinate(top), Coordinate(bottom));
     }
     svg.Path("grid", lines);
 }
 
 void DrawTickLabels(SvgText& svg, const TimeAxis& axis, double baseline) {
-    for (const Tick& tick : axis.Ticks(ticks)) {
+    for (const Tick& tick : axis.Ticks(axisTicks)) {
         svg.Text("tick", tick.x, baseline, Anchor::Middle, tick.label);
     }
 }

@@ -1,9 +1,13 @@
 #include "verbs/CommonOptions.h"
 
 #include <sstream>
+#include <stdexcept>
+#include <system_error>
 #include <vector>
 
 #include "boot/DotModel.h"
+#include "boot/InputText.h"
+#include "image/ImageFile.h"
 #include "verify/Report.h"
 #include "verify/Wording.h"
 
@@ -74,38 +78,82 @@ void TellUnread(const Findings& findings, const Invocation& invocation) {
     }
 }
 
-BootLog LogSource::ReadLog() const {
-    return ReadBootLog(log.empty() ? plugins.Image().Open(HostImage::profilingLog) : log);
-}
-
-BootModel LogSource::ReadModel(Findings& findings) const {
-    return dot.empty() ? ReadPlugins(plugins.Image(), plugins.options, findings)
-                       : ReadDotModel(dot);
-}
-
-BootModel LogSource::ReadModel() const {
+std::optional<BootModel> ReadPluginsIfThere(const BootSource& source,
+                                            std::vector<std::string>& remarks) {
     Findings findings;
-    return ReadModel(findings);
+    std::optional<BootModel> model;
+    try {
+        model = ReadPlugins(source.Image(), source.options, findings);
+    } catch (const std::system_error& error) {
+        if (source.options.directory != HostImage::pluginDirectory) {
+            throw;
+        }
+        remarks.push_back(std::string(error.what()) +
+                          ": nothing is known of the plugins' barriers");
+    }
+    SortFindings(findings);
+    for (const Finding& finding : findings) {
+        if (finding.severity == Severity::Error) {
+            remarks.push_back(Spelled(finding.place) + ": " + finding.text);
+        }
+    }
+    return model;
+}
+
+// The host's own stays within the host, also where a link of it points elsewhere.
+BootLog LogSource::ReadLog() const {
+    if (!log.empty()) {
+        return ReadBootLog(log);
+    }
+    const HostImage image = plugins.Image();
+    const std::string path = image.Open(HostImage::profilingLog);
+    const ImageFile file = ReadImageFile(image, HostImage::profilingLog, longestInput);
+    switch (file.kind) {
+    case ImageFile::Kind::Missing:
+    case ImageFile::Kind::Unreadable:
+        throw std::runtime_error(
+            path + ": cannot be opened: " + std::generic_category().message(file.error));
+    case ImageFile::Kind::Folder:
+    case ImageFile::Kind::Irregular:
+        throw std::runtime_error(path + ": not a regular file");
+    case ImageFile::Kind::Regular:
+        break;
+    }
+    std::istringstream stream(file.content);
+    return ParseBootLog(stream, path);
+}
+
+BootModel LogSource::ReadModel(std::vector<std::string>& remarks) const {
+    return dot.empty() ? ReadPluginsIfThere(plugins, remarks).value_or(BootModel())
+                       : ReadDotModel(dot);
 }
 
 BootTimeline LogSource::Read() const {
     const BootLog read = ReadLog();
-    Findings findings;
-    BootTimeline timeline = MakeTimeline(read, ReadModel(findings));
-    SortFindings(findings);
-    for (const Finding& finding : findings) {
-        if (finding.severity == Severity::Error) {
-            timeline.remarks.push_back(Spelled(finding.place) + ": " + finding.text);
-        }
-    }
+    std::vector<std::string> remarks;
+    BootTimeline timeline = MakeTimeline(read, ReadModel(remarks));
+    timeline.remarks.insert(timeline.remarks.end(), remarks.begin(), remarks.end());
     return timeline;
+}
+
+std::vector<std::string> LogSource::Inputs() const {
+    return {log.empty() ? plugins.Image().Open(HostImage::profilingLog) : log, dot};
+}
+
+CLI::Validator HasName() {
+    return CLI::Validator(
+        [](const std::string& text) {
+            return text.empty() ? std::string("the file has no name") : std::string();
+        },
+        "");
 }
 
 void AddLogOptions(CLI::App& verb, LogSource& source) {
     verb.add_option("LOG", source.log, "The profiling log; the host's own without it");
     verb.add_option("--dot", source.dot,
                     "Take the barriers from this drawing of vantor --dump-dependency-tree")
-        ->type_name("FILE");
+        ->type_name("FILE")
+        ->check(HasName());
     AddBootOptions(verb, source.plugins, DirectoryAs::Option);
 }
 

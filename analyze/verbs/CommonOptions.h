@@ -2,7 +2,9 @@
 #define VANTOR_ANALYZE_VERBS_COMMONOPTIONS_H
 
 #include <CLI/CLI.hpp>
+#include <optional>
 #include <string>
+#include <vector>
 
 #include "boot/BootTimeline.h"
 #include "image/DirectoryReader.h"
@@ -25,6 +27,9 @@ struct BootSource {
 enum class DirectoryAs { Argument, Option };
 void AddBootOptions(CLI::App& verb, BootSource& source, DirectoryAs directory);
 
+// For options whose value names a file: refuses an empty one.
+CLI::Validator HasName();
+
 // Tells on `error`, in a line, that reading the plugins has found errors, if it has: for verbs that
 // do their work without the plugins concerned.
 void TellUnread(const Findings& findings, const Invocation& invocation);
@@ -36,14 +41,24 @@ struct LogSource {
     std::string dot;  // a path of this machine; empty: the plugin directory
     BootSource plugins;
 
-    // Reads both. Plugins that could not be read are told in the timeline's remarks. Throws
-    // std::runtime_error or std::system_error when the log cannot be read.
+    // Reads both. Plugins that could not be read are told in the timeline's remarks, and so is a
+    // directory that is not there, when none was asked for. Throws std::runtime_error or
+    // std::system_error when the log, or what was asked for, cannot be read.
     BootTimeline Read() const;
+
+    // The files of this machine that it reads, as far as they are named.
+    std::vector<std::string> Inputs() const;
+
+private:
     BootLog ReadLog() const;
-    BootModel ReadModel() const;
-    // As above; `findings` is what reading the plugins has found, nothing with a drawing.
-    BootModel ReadModel(Findings& findings) const;
+    BootModel ReadModel(std::vector<std::string>& remarks) const;
 };
+
+// The plugins of the host's directory. Where nobody has named another one and it cannot be read,
+// `remarks` says so and there are none. Errors in plugins are told in `remarks` too. Throws as
+// ReadPlugins().
+std::optional<BootModel> ReadPluginsIfThere(const BootSource& source,
+                                            std::vector<std::string>& remarks);
 
 // Adds them to a verb whose argument is the log. `source` lives as long as the verb.
 void AddLogOptions(CLI::App& verb, LogSource& source);

@@ -30,8 +30,7 @@ struct DiffOptions {
     std::vector<std::string> before;
     std::vector<std::string> after;
     BootSource plugins;
-    bool hasPlugins = false;  // a directory or a host was named
-    std::string dot;          // of both sides
+    std::string dot;  // of both sides
     std::string dotBefore;
     std::string dotAfter;
     double leastMilliseconds = 5;
@@ -45,12 +44,12 @@ struct DiffOptions {
 struct ChainChange {
     std::vector<std::string> joined;
     std::vector<std::string> left;
-    std::vector<std::string> remarks;
 };
 
 struct Result {
     Comparison comparison;
-    std::optional<ChainChange> chain;
+    std::optional<ChainChange> chain;  // none without the plugins of both sides
+    std::vector<std::string> remarks;
 };
 
 std::vector<BootLog> ReadLogs(const std::vector<std::string>& paths) {
@@ -62,15 +61,12 @@ std::vector<BootLog> ReadLogs(const std::vector<std::string>& paths) {
     return logs;
 }
 
-std::optional<BootModel> ReadPluginsOf(const DiffOptions& options, const std::string& dot) {
+std::optional<BootModel> ReadPluginsOf(const DiffOptions& options, const std::string& dot,
+                                       std::vector<std::string>& remarks) {
     if (!dot.empty() || !options.dot.empty()) {
         return ReadDotModel(dot.empty() ? options.dot : dot);
     }
-    if (!options.hasPlugins) {
-        return std::nullopt;
-    }
-    Findings findings;
-    return ReadPlugins(options.plugins.Image(), options.plugins.options, findings);
+    return ReadPluginsIfThere(options.plugins, remarks);
 }
 
 // The names on the chain of a side's median boot; the timeline's remarks go to `remarks`.
@@ -97,18 +93,19 @@ std::vector<std::string> OnlyIn(const std::set<std::string>& one,
 
 std::optional<ChainChange> CompareChains(const DiffOptions& options,
                                          const std::vector<BootLog>& before,
-                                         const std::vector<BootLog>& after) {
-    const std::optional<BootModel> old = ReadPluginsOf(options, options.dotBefore);
-    const std::optional<BootModel> now = ReadPluginsOf(options, options.dotAfter);
+                                         const std::vector<BootLog>& after,
+                                         std::vector<std::string>& remarks) {
+    const std::optional<BootModel> old = ReadPluginsOf(options, options.dotBefore, remarks);
+    // What is to be said of one directory is said once.
+    std::vector<std::string> sameRemarks;
+    const std::optional<BootModel> now =
+        ReadPluginsOf(options, options.dotAfter, options.dotBefore.empty() ? sameRemarks : remarks);
     if (!old || !now) {
         return std::nullopt;
     }
-    ChainChange change;
-    const std::set<std::string> oldChain = ChainOf(before, *old, "old", change.remarks);
-    const std::set<std::string> newChain = ChainOf(after, *now, "new", change.remarks);
-    change.joined = OnlyIn(newChain, oldChain);
-    change.left = OnlyIn(oldChain, newChain);
-    return change;
+    const std::set<std::string> oldChain = ChainOf(before, *old, "old", remarks);
+    const std::set<std::string> newChain = ChainOf(after, *now, "new", remarks);
+    return ChainChange{OnlyIn(newChain, oldChain), OnlyIn(oldChain, newChain)};
 }
 
 std::string Signed(Microseconds time) { return (time > 0 ? "+" : "") + Milliseconds(time); }
@@ -166,13 +163,13 @@ void WriteText(const Result& result, const Invocation& invocation) {
     WriteTable(comparison, invocation);
     invocation.out << fmt::format("unchanged: {}\n", Count(comparison.unchanged, "plugin"));
     if (!result.chain) {
-        invocation.out << "critical chain: not compared, as no plugin directory or drawing is "
-                          "named (--directory, --dot)\n";
-        return;
+        invocation.out << "critical chain: not compared, as the plugins are not there "
+                          "(--directory, --dot)\n";
+    } else {
+        invocation.out << "onto the critical chain: " << NameList(result.chain->joined) << '\n'
+                       << "off the critical chain: " << NameList(result.chain->left) << '\n';
     }
-    invocation.out << "onto the critical chain: " << NameList(result.chain->joined) << '\n'
-                   << "off the critical chain: " << NameList(result.chain->left) << '\n';
-    TellRemarks(result.chain->remarks, invocation);
+    TellRemarks(result.remarks, invocation);
 }
 
 Json ToJson(const Change& change) {
@@ -210,7 +207,7 @@ Json Document(const Result& result) {
     if (result.chain) {
         document["chain"] = {{"joined", result.chain->joined}, {"left", result.chain->left}};
     }
-    document["remarks"] = result.chain ? result.chain->remarks : std::vector<std::string>();
+    document["remarks"] = result.remarks;
     return document;
 }
 
@@ -228,7 +225,8 @@ int Run(const DiffOptions& options, const Invocation& invocation) {
     const std::vector<BootLog> after = ReadLogs(newPaths);
     const NoiseRule rule{static_cast<Microseconds>(std::llround(options.leastMilliseconds * 1000)),
                          options.marginPercent / 100};
-    const Result result{CompareBoots(before, after, rule), CompareChains(options, before, after)};
+    Result result{CompareBoots(before, after, rule), std::nullopt, {}};
+    result.chain = CompareChains(options, before, after, result.remarks);
     if (options.format == "json") {
         WriteJson(Document(result), invocation.out);
     } else {
@@ -264,11 +262,14 @@ void AddOptions(CLI::App& verb, DiffOptions& options) {
     verb.add_option("--new", options.after, "Logs of several new boots")->type_name("LOG...");
     AddBootOptions(verb, options.plugins, DirectoryAs::Option);
     verb.add_option("--dot", options.dot, "A drawing of the plugins, in place of a directory")
-        ->type_name("FILE");
+        ->type_name("FILE")
+        ->check(HasName());
     verb.add_option("--old-dot", options.dotBefore, "A drawing of the old plugins")
-        ->type_name("FILE");
+        ->type_name("FILE")
+        ->check(HasName());
     verb.add_option("--new-dot", options.dotAfter, "A drawing of the new plugins")
-        ->type_name("FILE");
+        ->type_name("FILE")
+        ->check(HasName());
     verb.add_option("--least", options.leastMilliseconds,
                     "Differences up to so many milliseconds are noise")
         ->type_name("MS")
@@ -293,8 +294,7 @@ void AddDiff(CLI::App& app, Invocation& invocation) {
     CLI::App* const verb =
         app.add_subcommand("diff", "Compare two boots, or several on either side");
     AddOptions(*verb, *options);
-    verb->callback([options, verb, &invocation] {
-        options->hasPlugins = verb->count("--directory") > 0 || verb->count("--root") > 0;
+    verb->callback([options, &invocation] {
         invocation.action = [options, &invocation] { return Run(*options, invocation); };
     });
 }

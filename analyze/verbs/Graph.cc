@@ -1,16 +1,14 @@
 #include "verbs/Graph.h"
 
-#include <cerrno>
-#include <fstream>
 #include <limits>
 #include <memory>
 #include <sstream>
 #include <stdexcept>
 #include <string>
-#include <system_error>
 
 #include "verbs/CommonOptions.h"
 #include "verbs/Graphviz.h"
+#include "verbs/OutputFile.h"
 #include "verbs/Progress.h"
 #include "verify/Drawing.h"
 #include "verify/Explanation.h"
@@ -52,22 +50,13 @@ std::string Draw(const GraphOptions& options, const Invocation& invocation, Find
     return options.format == "svg" ? DrawAsSvg(drawing.str()) : drawing.str();
 }
 
-void Write(const std::string& drawing, const std::string& path) {
-    std::ofstream file(path, std::ios::binary | std::ios::trunc);
-    file << drawing;
-    file.close();
-    if (!file) {
-        throw std::system_error(errno, std::generic_category(), "cannot write " + path);
-    }
-}
-
 int DrawGraph(const GraphOptions& options, const Invocation& invocation) {
     Findings findings;
     const std::string drawing = Draw(options, invocation, findings);
     if (options.output.empty()) {
         invocation.out << drawing;
     } else {
-        Write(drawing, options.output);
+        WriteOutput(options.output, drawing, {});
     }
     TellUnread(findings, invocation);
     return statusClean;
@@ -91,8 +80,7 @@ void AddGraph(CLI::App& app, Invocation& invocation) {
         ->type_name("FORMAT")
         ->check(CLI::IsMember({"dot", "svg"}))
         ->capture_default_str();
-    verb.add_option("--output", options->output, "Write to FILE instead of standard output")
-        ->type_name("FILE");
+    AddOutputOption(verb, options->output);
     verb.callback([options, around, &invocation] {
         options->isWhole = around->count() == 0;
         invocation.action = [options, &invocation] { return DrawGraph(*options, invocation); };

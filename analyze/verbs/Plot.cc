@@ -1,8 +1,5 @@
 #include "verbs/Plot.h"
 
-#include <cerrno>
-#include <cstring>
-#include <fstream>
 #include <memory>
 #include <stdexcept>
 #include <string>
@@ -11,6 +8,7 @@
 #include "chart/Chart.h"
 #include "verbs/BootOutput.h"
 #include "verbs/CommonOptions.h"
+#include "verbs/OutputFile.h"
 #include "verbs/Progress.h"
 
 namespace vantor::analyze {
@@ -22,16 +20,6 @@ struct PlotOptions {
     std::string output;  // empty: standard output
     bool html = false;
 };
-
-void WriteFile(const std::string& path, const std::string& chart) {
-    errno = 0;
-    std::ofstream file(path, std::ios::binary);
-    file << chart;
-    file.close();
-    if (!file) {
-        throw std::runtime_error(path + ": cannot be written: " + std::strerror(errno));
-    }
-}
 
 std::string Draw(const PlotOptions& options, const BootTimeline& timeline) {
     const std::string& log = options.source.log;
@@ -65,7 +53,7 @@ int Run(const PlotOptions& options, const Invocation& invocation) {
     if (options.output.empty()) {
         invocation.out << chart;
     } else {
-        WriteFile(options.output, chart);
+        WriteOutput(options.output, chart, options.source.Inputs());
     }
     TellRemarks(FirstRemarks(timeline), invocation);
     return statusClean;
@@ -78,8 +66,7 @@ void AddPlot(CLI::App& app, Invocation& invocation) {
     CLI::App* const verb =
         app.add_subcommand("plot", "Draw the boot as an SVG picture or an HTML page");
     AddLogOptions(*verb, options->source);
-    verb->add_option("--output", options->output, "Write to FILE, not to standard output")
-        ->type_name("FILE");
+    AddOutputOption(*verb, options->output);
     verb->add_flag("--html", options->html, "Write a page with the picture in it");
     verb->callback([options, &invocation] {
         invocation.action = [options, &invocation] { return Run(*options, invocation); };

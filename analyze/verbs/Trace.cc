@@ -1,15 +1,13 @@
 #include "verbs/Trace.h"
 
-#include <cerrno>
-#include <cstring>
-#include <fstream>
 #include <memory>
-#include <stdexcept>
+#include <sstream>
 #include <string>
 
 #include "boot/TraceWriter.h"
 #include "verbs/BootOutput.h"
 #include "verbs/CommonOptions.h"
+#include "verbs/OutputFile.h"
 
 namespace vantor::analyze {
 
@@ -20,24 +18,14 @@ struct TraceOptions {
     std::string output;  // empty: standard output
 };
 
-void WriteFile(const BootTimeline& timeline, const std::string& path) {
-    errno = 0;
-    std::ofstream file(path);
-    if (file) {
-        WriteTrace(timeline, file);
-        file.close();
-    }
-    if (!file) {
-        throw std::runtime_error(path + ": cannot be written: " + std::strerror(errno));
-    }
-}
-
 int Run(const TraceOptions& options, const Invocation& invocation) {
     const BootTimeline timeline = options.source.Read();
     if (options.output.empty()) {
         WriteTrace(timeline, invocation.out);
     } else {
-        WriteFile(timeline, options.output);
+        std::ostringstream trace;
+        WriteTrace(timeline, trace);
+        WriteOutput(options.output, trace.str(), options.source.Inputs());
     }
     TellRemarks(timeline.remarks, invocation);
     return statusClean;
@@ -50,8 +38,7 @@ void AddTrace(CLI::App& app, Invocation& invocation) {
     CLI::App* const verb =
         app.add_subcommand("trace", "Write the boot as Trace Event JSON, which Perfetto opens");
     AddLogOptions(*verb, options->source);
-    verb->add_option("--output", options->output, "Write to FILE, not to standard output")
-        ->type_name("FILE");
+    AddOutputOption(*verb, options->output);
     verb->callback([options, &invocation] {
         invocation.action = [options, &invocation] { return Run(*options, invocation); };
     });

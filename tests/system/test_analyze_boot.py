@@ -6,6 +6,7 @@ import os
 import pty
 import struct
 import termios
+import threading
 
 import pytest
 
@@ -269,6 +270,98 @@ def test_a_log_that_is_not_there_is_told(analyze):
         "vantor-analyze: /nonexistent/log: cannot be opened: No such file or directory\n")
 
 
+# A host whose plugins are not there, and what is said of that.
+NO_HOST = "--root=/nonexistent"
+NO_PLUGINS = ("note: /nonexistent/usr/libexec/vantor/plugins: No such file or directory: nothing is "
+              "known of the plugins' barriers\n")
+
+
+def test_without_the_plugins_of_the_host_the_log_alone_is_read(analyze, boot):
+    done = analyze("blame", boot[0], NO_HOST)
+    assert (done.status, done.stderr) == (
+        0, "note: 'disks', 'look', 'slow': only in the log, taken to provide and require nothing\n"
+        + NO_PLUGINS)
+    assert len(done.stdout.splitlines()) == 5
+
+
+def test_a_directory_that_is_named_must_be_there(analyze, boot):
+    done = analyze("blame", boot[0], "--directory=/nonexistent")
+    assert (done.status, done.stdout, done.stderr) == (
+        3, "", "vantor-analyze: /nonexistent: No such file or directory\n")
+
+
+def test_the_log_of_a_host_stays_within_the_host(analyze, root):
+    lay_out(root)
+    root.write("/var/log/real.log", LOG)
+    root.remove("/var/log/sysboot.log")
+    root.symlink("/var/log/real.log", "/var/log/sysboot.log")
+    done = analyze("blame", "--root", root.folder)
+    assert done.status == 0
+    assert "disks" in done.stdout
+    root.remove("/var/log/sysboot.log")
+    root.fifo("/var/log/sysboot.log")
+    done = analyze("blame", "--root", root.folder)
+    assert (done.status, done.stdout, done.stderr) == (
+        3, "", f"vantor-analyze: {root.folder}/var/log/sysboot.log: not a regular file\n")
+
+
+@pytest.mark.parametrize("option", ["LOG", "--dot"])
+def test_no_more_is_read_than_a_boot_can_leave(analyze, boot, option):
+    if not os.path.exists("/dev/zero"):
+        pytest.skip("there is no /dev/zero here")
+    arguments = ["/dev/zero"] if option == "LOG" else [boot[0], "--dot=/dev/zero"]
+    done = analyze("blame", *arguments)
+    assert (done.status, done.stdout, done.stderr) == (
+        3, "", "vantor-analyze: /dev/zero: longer than any boot leaves: more than 268435456 "
+        "bytes\n")
+
+
+@pytest.mark.parametrize("verb", ["plot", "trace"])
+def test_what_is_read_is_not_overwritten(analyze, boot, verb):
+    drawing = boot[2]
+    for path in (boot[0], drawing):
+        with open(path, "rb") as file:
+            content = file.read()
+        done = analyze(verb, *boot, f"--output={path}")
+        assert (done.status, done.stdout, done.stderr) == (
+            3, "", f"vantor-analyze: {path}: is what the result is made from, not overwritten\n")
+        with open(path, "rb") as file:
+            assert file.read() == content
+
+
+@pytest.mark.parametrize("option", ["--dot", "--output"])
+def test_a_file_without_a_name_is_refused(analyze, boot, option):
+    done = analyze("trace", boot[0], f"{option}=")
+    assert (done.status, done.stdout) == (3, "")
+    assert f"{option}: the file has no name" in done.stderr
+
+
+def test_a_verb_that_takes_long_says_so_on_a_terminal(analyze, boot, tmp_path):
+    os.mkfifo(tmp_path / "slow.log")
+    ours, theirs = pty.openpty()
+    said = b""
+
+    def write_slowly():
+        nonlocal said
+        with open(tmp_path / "slow.log", "w", encoding="utf-8") as log:
+            # The line stands there from the first second on; the log comes only behind it.
+            while b")" not in said:
+                said += os.read(ours, 4096)
+            log.write(LOG)
+
+    writer = threading.Thread(target=write_slowly)
+    writer.start()
+    done = analyze("plot", str(tmp_path / "slow.log"), *boot[1:], stderr=theirs)
+    writer.join()
+    os.close(theirs)
+    rest = os.read(ours, 4096)
+    os.close(ours)
+    assert done.status == 0
+    assert said == b"\rdrawing the boot (1 s)"
+    assert rest.endswith(b"\r\x1b[K")
+    assert done.stdout.startswith("<?xml")
+
+
 @pytest.fixture
 def logs(tmp_path):
     """logs(name, end of look, end of the run, name of slow) writes another boot's log."""
@@ -282,8 +375,8 @@ def logs(tmp_path):
 
 
 def test_diff_of_two_boots(analyze, logs):
-    done = analyze("diff", logs("old"), logs("new", look="151", end="160", slow="other"))
-    assert (done.status, done.stderr) == (0, "")
+    done = analyze("diff", logs("old"), logs("new", look="151", end="160", slow="other"), NO_HOST)
+    assert (done.status, done.stderr) == (0, NO_PLUGINS)
     assert done.stdout == (
         "1 boot before, 1 boot after; all times in ms, medians where there are several\n"
         "total: 100.000 before, 160.000 after, +60.000 (+60.0 %), slower\n"
@@ -292,8 +385,7 @@ def test_diff_of_two_boots(analyze, logs):
         "added\t-\t-\t-\t-\tother\n"
         "removed\t-\t-\t-\t-\tslow\n"
         "unchanged: 1 plugin\n"
-        "critical chain: not compared, as no plugin directory or drawing is named (--directory, "
-        "--dot)\n")
+        "critical chain: not compared, as the plugins are not there (--directory, --dot)\n")
 
 
 def test_diff_of_several_boots_a_side_goes_by_their_spread(analyze, logs):
@@ -322,6 +414,12 @@ def test_diff_names_what_moved_onto_the_critical_chain(analyze, logs, boot):
     assert "onto the critical chain: slow\noff the critical chain: disks, look\n" in done.stdout
 
 
+def test_diff_compares_the_chains_of_the_hosts_own_plugins(analyze, logs, root):
+    lay_out(root)
+    done = analyze("diff", logs("old"), logs("new"), "--root", root.folder)
+    assert "onto the critical chain: none\noff the critical chain: none\n" in done.stdout
+
+
 @pytest.mark.parametrize("limit, status", [("59.9", 2), ("60", 0), ("100", 0), ("0", 2)])
 def test_diff_is_a_gate_for_the_total(analyze, logs, limit, status):
     done = analyze("diff", logs("old"), logs("new", end="160"), f"--fail-over={limit}")
@@ -331,14 +429,14 @@ def test_diff_is_a_gate_for_the_total(analyze, logs, limit, status):
 def test_diff_is_no_gate_for_noise(analyze, logs):
     old = [logs("old"), logs("old2", end="190")]
     new = [logs("new", end="110"), logs("new2", end="195")]
-    done = analyze("diff", "--old", *old, "--new", *new, "--fail-over=1")
+    done = analyze("diff", "--old", *old, "--new", *new, "--fail-over=1", NO_HOST)
     assert "within the noise" in done.stdout
-    assert (done.status, done.stderr) == (0, "")
+    assert (done.status, done.stderr) == (0, NO_PLUGINS)
 
 
 def test_diff_says_that_the_total_grew_too_much(analyze, logs):
-    done = analyze("diff", logs("old"), logs("new", end="160"), "--fail-over=10")
-    assert done.stderr == "vantor-analyze: the total grew by more than 10 %\n"
+    done = analyze("diff", logs("old"), logs("new", end="160"), "--fail-over=10", NO_HOST)
+    assert done.stderr == NO_PLUGINS + "vantor-analyze: the total grew by more than 10 %\n"
 
 
 @pytest.mark.parametrize("value", ["nan", "-1", "1e7", "inf", "1x", ""])

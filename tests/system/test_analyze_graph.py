@@ -110,7 +110,7 @@ def test_a_file_that_cannot_be_written(host):
     result = analyze(host, "graph", "--output=/nowhere/graph.dot")
     assert (result.status, result.stdout) == (3, "")
     assert result.stderr == (
-        "vantor-analyze: cannot write /nowhere/graph.dot: No such file or directory\n")
+        "vantor-analyze: /nowhere/graph.dot: cannot be written: No such file or directory\n")
 
 
 def test_svg_without_graphviz(host):
@@ -205,6 +205,11 @@ def test_explaining_an_unknown_name(host):
     assert (result.status, result.stdout, result.stderr) == (
         3, "", "vantor-analyze: no plugin and no barrier has the name 'storge'; did you mean "
         "plugin 'store' or barrier \"storage\"?\n")
+
+
+@pytest.mark.parametrize("name", ["store.json", f"{PLUGINS}/store.json"])
+def test_a_plugin_may_be_named_by_its_file(host, name):
+    assert analyze(host, "explain", name).stdout == analyze(host, "explain", "store").stdout != ""
 
 
 def test_explaining_nothing_is_refused(host):

@@ -9,14 +9,15 @@ from harness.waiting import LIMIT_SECONDS
 NAME = "vantor-analyze"
 
 
-def run_analyze(root, *arguments, stdout=None, environment=None):
+def run_analyze(root, *arguments, stdout=None, stderr=None, environment=None):
     """Runs the program of the root's build on this machine, with these words and no others.
 
-    stdout          a descriptor in place of the recorded output
+    stdout, stderr  descriptors in place of the recorded outputs
     """
     command = [os.path.join(root.base.build, "bin", NAME), *arguments]
     done = subprocess.run(
-        command, stdin=subprocess.DEVNULL, stdout=stdout or subprocess.PIPE, stderr=subprocess.PIPE,
+        command, stdin=subprocess.DEVNULL, stdout=stdout or subprocess.PIPE,
+        stderr=stderr or subprocess.PIPE,
         timeout=LIMIT_SECONDS, check=False, env={**ENVIRONMENT, **(environment or {})}, cwd="/")
     return Result(command, done.returncode, _text(done.stdout), _text(done.stderr))
 

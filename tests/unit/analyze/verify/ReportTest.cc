@@ -14,7 +14,7 @@ std::string Text(const Findings& findings, bool colour = false) {
     return stream.str();
 }
 
-std::string Json(const Findings& findings) {
+std::string JsonText(const Findings& findings) {
     std::ostringstream stream;
     WriteJson(findings, stream);
     return stream.str();
@@ -68,9 +68,9 @@ TEST(ReportTest, StrictMakesWarningsErrorsAndLeavesNotes) {
 }
 
 TEST(ReportTest, JsonHoldsWhatIsKnown) {
-    EXPECT_EQ(nlohmann::json::parse(Json({{Severity::Error, "x", {"/p", 3, 7}, "a"},
-                                          {Severity::Warning, "y", {"/q", 0, 0}, "b"},
-                                          {Severity::Note, "z", {}, "c"}})),
+    EXPECT_EQ(nlohmann::json::parse(JsonText({{Severity::Error, "x", {"/p", 3, 7}, "a"},
+                                              {Severity::Warning, "y", {"/q", 0, 0}, "b"},
+                                              {Severity::Note, "z", {}, "c"}})),
               nlohmann::json::parse(R"({
                   "findings": [
                       {"severity": "error", "code": "x", "path": "/p", "line": 3, "column": 7,
@@ -81,13 +81,13 @@ TEST(ReportTest, JsonHoldsWhatIsKnown) {
 }
 
 TEST(ReportTest, JsonOfNothingIsAnEmptyList) {
-    EXPECT_EQ(nlohmann::json::parse(Json({})), nlohmann::json::parse(R"({"findings": [],
+    EXPECT_EQ(nlohmann::json::parse(JsonText({})), nlohmann::json::parse(R"({"findings": [],
                   "summary": {"errors": 0, "warnings": 0, "notes": 0}})"));
 }
 
 TEST(ReportTest, JsonStaysJsonWhateverBytesNamesHold) {
     const auto report =
-        nlohmann::json::parse(Json({{Severity::Error, "x", {"/\xff", 0, 0}, "\n"}}));
+        nlohmann::json::parse(JsonText({{Severity::Error, "x", {"/\xff", 0, 0}, "\n"}}));
     EXPECT_EQ(report["findings"][0]["path"], "/\xef\xbf\xbd");
     EXPECT_EQ(report["findings"][0]["text"], "\n");
 }

@@ -1,4 +1,4 @@
-#include "CommandLine.h"
+#include "verbs/CommandLine.h"
 
 #include <fmt/format.h>
 #include <sys/ioctl.h>
@@ -100,22 +100,24 @@ int Fail(const Invocation& invocation, std::string_view what) {
     return statusCouldNotLook;
 }
 
+// The status of what has been done, once its result is out.
+int Flushed(int status, const Invocation& invocation) {
+    invocation.out.flush();
+    return invocation.out ? status : Fail(invocation, "the result could not be written");
+}
+
 // Has the parser answer the line itself (help, version) or refuse it.
 int Answer(const CLI::App& app, const CLI::ParseError& error, const Invocation& invocation) {
     if (error.get_exit_code() == 0) {
         app.exit(error, invocation.out, invocation.error);
-        return statusClean;
+        return Flushed(statusClean, invocation);
     }
     Fail(invocation, DescribeMistake(app, error));
     invocation.error << "usage: " << programName << " --help for usage information\n";
     return statusCouldNotLook;
 }
 
-int Act(const Invocation& invocation) {
-    const int status = invocation.action();
-    invocation.out.flush();
-    return invocation.out ? status : Fail(invocation, "the result could not be written");
-}
+int Act(const Invocation& invocation) { return Flushed(invocation.action(), invocation); }
 
 }  // namespace
 
