@@ -163,8 +163,8 @@ TEST_F(ReadyQueueTest, AMillionRandomStepsChooseAsAPlainScanDoes) {
     }
     PlainScan model;
     std::size_t choices = 0;
-    const int steps = support::underSanitizers ? 100000 : 1000000;
-    for (int step = 0; step < steps; ++step) {
+    const int stepCount = support::underSanitizers ? 100000 : 1000000;
+    for (int step = 0; step < stepCount; ++step) {
         const bool push = model.Empty() || (!idle.empty() && random() % 2 == 0);
         if (push) {
             std::swap(idle[random() % idle.size()], idle.back());
@@ -183,7 +183,7 @@ TEST_F(ReadyQueueTest, AMillionRandomStepsChooseAsAPlainScanDoes) {
         idle.push_back(&taken);
         ++choices;
     }
-    EXPECT_GT(choices, static_cast<std::size_t>(steps) * 2 / 5);
+    EXPECT_GT(choices, static_cast<std::size_t>(stepCount) * 2 / 5);
 }
 
 }  // namespace

@@ -284,13 +284,13 @@ TEST_F(JsonFileTest, FileMayBeReadThroughSmallBuffers) {
 }
 
 TEST_F(JsonFileTest, StringMayBeLargerThanTheBufferOfAFile) {
-    const std::string large(100 * fileBuffer + 1, 'x');
-    WriteFile(path, "[\"" + large + "\", 1]");
+    const std::string largeText(100 * fileBuffer + 1, 'x');
+    WriteFile(path, "[\"" + largeText + "\", 1]");
     std::ifstream stream(path, std::ios_base::in | std::ios_base::binary);
     JsonValue value;
     ReadValue(stream, value);
     ASSERT_EQ(value.elements.size(), 2U);
-    EXPECT_EQ(value.elements[0].text, large);
+    EXPECT_EQ(value.elements[0].text, largeText);
     EXPECT_EQ(Show(value.elements[1]), "1");
 }
 
