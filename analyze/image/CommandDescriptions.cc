@@ -78,7 +78,8 @@ CommandDescriptions::CommandDescriptions(const HostImage& image, Ownership& owne
         std::vector<DescriptionFile> files;
         for (const std::string& name : ListImageFolder(image, folder)) {
             if (BaseKit::impl::IsDescriptionName(name)) {
-                paths.push_back(folder + "/" + name);
+                paths.push_back(folder);
+                paths.back().append("/").append(name);
                 files.push_back(ReadFile(image, paths.back(), ownership, findings));
             }
         }

@@ -63,9 +63,8 @@ std::string LibrarySearch::FindIn(const std::string& searchPath, const std::stri
         for (const char* const spelling : {"$LIB", "${LIB}"}) {
             ReplaceAll(folder, spelling, libraryFolder);
         }
-        const std::string path = folder + "/" + name;
-        if (!folder.empty() && IsLibrary(path)) {
-            return path;
+        if (!folder.empty() && IsLibrary(folder.append("/").append(name))) {
+            return folder;
         }
     }
     return {};

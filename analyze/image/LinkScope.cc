@@ -27,10 +27,11 @@ Finding Refusal(const std::string& code, const PluginSource& source, const std::
             InvalidPluginException(source.bootPath, reason).what()};
 }
 
-Finding DependsOnOrder(const PluginSource& source, const std::string& what,
+// `what` is a kind of thing that only other plugins have.
+Finding DependsOnOrder(const PluginSource& source, const std::string& what, const std::string& name,
                        const std::vector<std::string>& others) {
     return {Severity::Warning, "load-order", source.place,
-            what + " is that of " + Few(others) +
+            "the " + what + " \"" + name + "\" is that of " + Few(others) +
                 ": the boot loads this one only if the directory lists that one before it"};
 }
 
@@ -169,8 +170,7 @@ bool LinkScope::HasLibraries(const Plugin& plugin, const Closure& closure,
     }
     const std::vector<std::string> others = Others(pluginsByName, closure.missing, plugin);
     if (!others.empty()) {
-        findings.push_back(
-            DependsOnOrder(plugin.source, "the library \"" + closure.missing + "\"", others));
+        findings.push_back(DependsOnOrder(plugin.source, "library", closure.missing, others));
         return true;
     }
     findings.push_back(Refusal("missing-library", plugin.source,
@@ -216,32 +216,36 @@ bool LinkScope::HasVersions(const Plugin& plugin, const Closure& closure,
                [&](const auto& library) { return lacks(library->linkage, library->path); });
 }
 
+// Whether an object that is loaded for a plugin, or the plugin itself, finds the symbols of its
+// data.
+bool LinkScope::FindsLoadImports(const Library& object, const Plugin& plugin,
+                                 const Closure& closure, Findings& findings) const {
+    const std::vector<std::string>& own = plugin.linkage.exports;
+    for (const std::string& symbol : object.linkage.loadImports) {
+        if (IsDefined(symbol, closure) || std::find(own.begin(), own.end(), symbol) != own.end()) {
+            continue;
+        }
+        const std::vector<std::string> others = Others(pluginsBySymbol, symbol, plugin);
+        if (others.empty()) {
+            std::string reason = object.path;
+            reason.append(": undefined symbol: ").append(symbol);
+            findings.push_back(Refusal("undefined-symbol", plugin.source, reason));
+            return false;
+        }
+        findings.push_back(DependsOnOrder(plugin.source, "symbol", symbol, others));
+    }
+    return true;
+}
+
 // The linker looks at the libraries before it looks at what needs them.
 bool LinkScope::HasLoadImports(const Plugin& plugin, const Closure& closure,
                                Findings& findings) const {
-    const auto lacks = [&](const Linkage& linkage, const std::string& path) {
-        const std::vector<std::string>& own = plugin.linkage.exports;
-        for (const std::string& symbol : linkage.loadImports) {
-            if (IsDefined(symbol, closure) ||
-                (&linkage != &plugin.linkage &&
-                 std::find(own.begin(), own.end(), symbol) != own.end())) {
-                continue;
-            }
-            const std::vector<std::string> others = Others(pluginsBySymbol, symbol, plugin);
-            if (others.empty()) {
-                findings.push_back(Refusal("undefined-symbol", plugin.source,
-                                           path + ": undefined symbol: " + symbol));
-                return true;
-            }
-            findings.push_back(
-                DependsOnOrder(plugin.source, "the symbol \"" + symbol + "\"", others));
-        }
-        return false;
+    const auto finds = [&](const Library& object) {
+        return FindsLoadImports(object, plugin, closure, findings);
     };
-    const bool librariesLack =
-        std::any_of(closure.libraries.rbegin(), closure.libraries.rend(),
-                    [&](const auto& library) { return lacks(library->linkage, library->path); });
-    return !librariesLack && !lacks(plugin.linkage, plugin.source.bootPath);
+    return std::all_of(closure.libraries.rbegin(), closure.libraries.rend(),
+                       [&](const auto& library) { return finds(*library); }) &&
+           finds({plugin.source.bootPath, plugin.linkage, {}});
 }
 
 // By then every plugin has been loaded, in whatever order.

@@ -70,6 +70,8 @@ private:
     // Each tells of the first thing that the linker refuses the plugin for, if there is one.
     bool HasLibraries(const Plugin& plugin, const Closure& closure, Findings& findings) const;
     bool HasVersions(const Plugin& plugin, const Closure& closure, Findings& findings) const;
+    bool FindsLoadImports(const Library& object, const Plugin& plugin, const Closure& closure,
+                          Findings& findings) const;
     bool HasLoadImports(const Plugin& plugin, const Closure& closure, Findings& findings) const;
     void CheckCallImports(const Plugin& plugin, const Closure& closure, Findings& findings) const;
 

@@ -6,7 +6,7 @@ namespace vantor::analyze {
 
 namespace {
 
-constexpr std::size_t mostNamed = 3;  // exporters in one sentence
+constexpr std::size_t mostExporters = 3;  // exporters in one sentence
 
 }  // namespace
 
@@ -44,7 +44,7 @@ std::string SharedNames::Others(const Exporters& exporters, std::size_t object) 
     std::string others;
     std::size_t count = 0;
     // Beyond those that are named the number is enough: no list grows with the directory.
-    for (std::size_t at = 0; at < exporters.size() && count < mostNamed; ++at) {
+    for (std::size_t at = 0; at < exporters.size() && count < mostExporters; ++at) {
         if (exporters[at] != object) {
             others += (count == 0 ? "" : ", ") + objects[exporters[at]].place.path;
             ++count;
