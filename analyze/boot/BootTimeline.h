@@ -16,8 +16,8 @@ struct TimelineEntry {
     static constexpr std::size_t none = static_cast<std::size_t>(-1);
 
     std::string name;
-    Microseconds requested =
-        0;                      // all plugins were loaded: the first start of any, for all the same
+    // All plugins were loaded: the first start of any, for all the same.
+    Microseconds requested = 0;
     Microseconds released = 0;  // its last barrier was done; `requested` when it waited for none
     Microseconds start = 0;
     Microseconds end = 0;

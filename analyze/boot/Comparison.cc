@@ -81,6 +81,8 @@ void AddPlugin(const std::string& name, const BothSides& sides, const NoiseRule&
         (sides.before.isListed ? comparison.nowRun : comparison.added).push_back(name);
     } else if (ranBefore) {
         (sides.after.isListed ? comparison.noLongerRun : comparison.removed).push_back(name);
+    } else if (sides.before.isListed != sides.after.isListed) {
+        (sides.after.isListed ? comparison.added : comparison.removed).push_back(name);
     }
 }
 

@@ -52,8 +52,8 @@ struct PluginChange {
 struct Comparison {
     std::size_t boots[2] = {0, 0};
     Change total;                      // of the whole run, from its start to its end
-    std::vector<std::string> added;    // run by some new boot, in no old log
-    std::vector<std::string> removed;  // run by some old boot, in no new log
+    std::vector<std::string> added;    // in a new log, in no old one
+    std::vector<std::string> removed;  // in an old log, in no new one
     std::vector<std::string> nowRun;   // listed by old logs, but not run then
     std::vector<std::string> noLongerRun;
     std::vector<PluginChange> slower;

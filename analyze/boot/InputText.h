@@ -15,6 +15,9 @@ constexpr std::size_t longestInput = std::size_t{256} << 20U;
 // `limit` bytes.
 std::string ReadInput(const std::string& path, std::size_t limit = longestInput);
 
+// Throws what ReadInput() throws for too long a text.
+[[noreturn]] void ThrowTooLong(const std::string& path, std::size_t limit);
+
 }  // namespace vantor::analyze
 
 #endif

@@ -41,6 +41,13 @@ DebugDescription::DebugDescription(const HostImage& image, Findings& findings) {
         findings.push_back({Severity::Warning, "unreadable", LineOf(0),
                             "cannot be read: " + std::generic_category().message(file.error)});
     }
+    if (file.kind == ImageFile::Kind::Irregular) {
+        findings.push_back({Severity::Error, "unreadable", LineOf(0),
+                            "is no regular file: the boot may wait for it for ever"});
+    } else if (file.kind == ImageFile::Kind::Folder) {
+        findings.push_back({Severity::Warning, "unreadable", LineOf(0),
+                            "is a folder: the boot finds no entry in it"});
+    }
     std::istringstream stream(file.content);
     const auto report = [&findings](int line, const std::string& text) {
         findings.push_back({Severity::Warning, "malformed-entry", LineOf(line), text});

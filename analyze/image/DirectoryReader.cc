@@ -19,9 +19,9 @@
 #include "image/DocumentDescription.h"
 #include "image/ImageFile.h"
 #include "image/LinkScope.h"
+#include "image/LinkerCache.h"
 #include "image/NativeDescription.h"
 #include "image/Ownership.h"
-#include "image/SharedNames.h"
 #include "plugins/Exceptions.h"
 #include "plugins/FilterRules.h"
 
@@ -66,6 +66,7 @@ public:
 
 private:
     void CheckFolders();
+    void CheckOwner(const std::string& path, const ImageFile& file);
     void DropRefused(const std::set<std::string>& paths);
     std::optional<Architecture> FindArchitecture(const std::vector<std::string>& names) const;
     void ReadFile(const std::string& fileName);
@@ -85,7 +86,6 @@ private:
     Ownership ownership;
     CommandDescriptions commands;
     std::optional<LinkScope> scope;  // made for the first native plugin
-    SharedNames sharedNames;
     std::optional<Architecture> boot;
     BootModel model;
 };
@@ -104,7 +104,9 @@ BootModel Directory::Read() {
     commands.CheckFolders(model, findings);
     if (scope) {
         DropRefused(scope->Report(findings));
-        sharedNames.Report(*scope, findings);
+        for (const std::string& library : scope->Libraries()) {
+            CheckOwner(library, ReadImageFile(image, library, 0));
+        }
     }
     for (PluginDescription& plugin : debug.OfConfiguration(findings)) {
         model.plugins.push_back(std::move(plugin));
@@ -121,17 +123,22 @@ void Directory::DropRefused(const std::set<std::string>& paths) {
     model.plugins.erase(std::remove_if(model.plugins.begin(), model.plugins.end(), isRefused),
                         model.plugins.end());
     model.notLoaded.insert(model.notLoaded.end(), paths.begin(), paths.end());
-    sharedNames.Forget(paths);
 }
 
 void Directory::CheckFolders() {
     ownership.CheckFoldersOf(Join(options.directory, "."), findings);
-    for (const char* const path : {HostImage::debugConfiguration, HostImage::program}) {
-        const ImageFile file = ReadImageFile(image, path, 0);
-        ownership.CheckFoldersOf(path, findings);
-        if (file.kind != ImageFile::Kind::Missing) {
-            ownership.Check(path, file.status, findings);
-        }
+    for (const char* const path :
+         {HostImage::debugConfiguration, HostImage::program, LinkerCache::path}) {
+        CheckOwner(path, ReadImageFile(image, path, 0));
+    }
+}
+
+// Of a file with the folders that it lies in, under its own name and where that leads.
+void Directory::CheckOwner(const std::string& path, const ImageFile& file) {
+    ownership.CheckFoldersOf(path, findings);
+    if (file.kind != ImageFile::Kind::Missing) {
+        ownership.Check(path, file.status, findings);
+        ownership.CheckFoldersOf(ResolveInImage(image, path), findings);
     }
 }
 
@@ -227,9 +234,7 @@ void Directory::ReadNativeFile(const PluginFile& file, const PluginSource& sourc
     if (!IsReadable(object, source)) {
         return;
     }
-    if (object.kind != ImageFile::Kind::Missing) {
-        ownership.Check(source.place.path, object.status, findings);
-    }
+    CheckOwner(source.place.path, object);
     if (object.kind == ImageFile::Kind::Missing) {
         Reject(source, source.bootPath + ": cannot open shared object file: " +
                            std::generic_category().message(object.error));
@@ -243,11 +248,12 @@ void Directory::ReadNativeFile(const PluginFile& file, const PluginSource& sourc
         if (!scope) {
             scope.emplace(image, architecture);
         }
+        PluginSource identified = source;
+        identified.file = {object.status.st_dev, object.status.st_ino};
         std::optional<NativeReading> reading =
-            ReadNative(object.content, architecture, source, findings, &*scope);
+            ReadNative(object.content, architecture, identified, findings, &*scope);
         if (reading) {
-            scope->Keep(source);
-            sharedNames.Add(*reading);
+            scope->Keep(reading->opened, std::move(reading->sharedParts));
             Add(file, std::move(reading->plugin));
         }
     }
@@ -258,9 +264,7 @@ void Directory::ReadDocumentFile(const PluginFile& file, const PluginSource& sou
     if (!IsReadable(document, source)) {
         return;
     }
-    if (document.kind != ImageFile::Kind::Missing) {
-        ownership.Check(source.place.path, document.status, findings);
-    }
+    CheckOwner(source.place.path, document);
     if (document.kind != ImageFile::Kind::Regular) {
         RejectMissingDocument(source, findings);
         return;

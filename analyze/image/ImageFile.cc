@@ -2,6 +2,7 @@
 
 #include <dirent.h>
 #include <fcntl.h>
+#include <limits.h>
 #include <linux/openat2.h>
 #include <sys/syscall.h>
 #include <unistd.h>
@@ -9,7 +10,11 @@
 #include <algorithm>
 #include <cerrno>
 #include <memory>
+#include <sstream>
 #include <system_error>
+#include <utility>
+
+#include "image/ReadFiles.h"
 
 namespace vantor::analyze {
 
@@ -26,6 +31,27 @@ int OpenBelow(int root, const std::string& path, int flags) {
     how.flags = static_cast<std::uint64_t>(static_cast<unsigned>(flags));
     how.resolve = RESOLVE_IN_ROOT;
     return static_cast<int>(syscall(SYS_openat2, root, path.c_str(), &how, sizeof how));
+}
+
+// The parts of a path, last first, without those that lead nowhere.
+std::vector<std::string> Parts(const std::string& path) {
+    std::vector<std::string> parts;
+    std::istringstream rest(path);
+    for (std::string part; std::getline(rest, part, '/');) {
+        if (!part.empty() && part != ".") {
+            parts.push_back(part);
+        }
+    }
+    std::reverse(parts.begin(), parts.end());
+    return parts;
+}
+
+// Empty for what is no link.
+std::string LinkTarget(const std::string& path) {
+    std::string target(PATH_MAX, '\0');
+    const ssize_t length = readlink(path.c_str(), target.data(), target.size());
+    target.resize(length < 0 ? 0 : static_cast<std::size_t>(length));
+    return target;
 }
 
 ImageFile::Kind KindOf(const struct stat& status) {
@@ -58,6 +84,38 @@ int ReadContent(int file, std::size_t size, std::string& content) {
 
 }  // namespace
 
+std::string ResolveInImage(const HostImage& image, const std::string& path) {
+    constexpr int mostLinks = 40;  // as the kernel
+    if (path.empty() || path.front() != '/') {
+        return path;
+    }
+    std::vector<std::string> rest = Parts(path);  // last first
+    std::string resolved;
+    for (int links = 0; !rest.empty();) {
+        const std::string part = std::move(rest.back());
+        rest.pop_back();
+        if (part == "..") {
+            resolved.erase(resolved.empty() ? 0 : resolved.rfind('/'));
+            continue;
+        }
+        std::string next = resolved;
+        next.append("/").append(part);
+        const std::string target = links < mostLinks ? LinkTarget(image.Open(next)) : "";
+        if (target.empty()) {
+            resolved = std::move(next);
+            continue;
+        }
+        ++links;
+        if (target.front() == '/') {
+            resolved.clear();
+        }
+        for (std::string& one : Parts(target)) {
+            rest.push_back(std::move(one));
+        }
+    }
+    return resolved.empty() ? "/" : resolved;
+}
+
 FileDescriptor OpenInImage(const HostImage& image, const std::string& path, int flags) {
     // Off a 32-bit host's beaten track too: openat2(2) sets no flag of its own, and refuses this
     // one for a file that is only named.
@@ -71,7 +129,8 @@ FileDescriptor OpenInImage(const HostImage& image, const std::string& path, int 
     if (below >= 0 || (errno != ENOSYS && errno != EPERM)) {
         return FileDescriptor(below);
     }
-    return FileDescriptor(open(place.c_str(), allFlags));  // a kernel that cannot
+    // A kernel that cannot, or a container that may not ask it.
+    return FileDescriptor(open(image.Open(ResolveInImage(image, path)).c_str(), allFlags));
 }
 
 ImageFile ReadImageFile(const HostImage& image, const std::string& path, std::size_t limit) {
@@ -89,6 +148,7 @@ ImageFile ReadImageFile(const HostImage& image, const std::string& path, std::si
         return result;
     }
     const FileDescriptor file = OpenInImage(image, path, O_RDONLY | O_NONBLOCK | O_NOCTTY);
+    NoteRead(result.status);
     const auto fileSize = static_cast<std::uint64_t>(result.status.st_size);
     const std::uint64_t size = std::min<std::uint64_t>(limit, fileSize);
     if (!file.IsOpen()) {

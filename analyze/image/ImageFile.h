@@ -11,10 +11,13 @@
 
 namespace vantor::analyze {
 
+// The path on the host that a path leads to: all links followed as on the host, what does not exist
+// taken as it stands. A relative path is left as it is.
+std::string ResolveInImage(const HostImage& image, const std::string& path);
+
 // Opens a path of the host for reading, or with `flags` of open(2). Symbolic links lead where they
-// lead on the host, also absolute ones of a host that lies in a folder, as far as the kernel can
-// follow them there. No terminal becomes the controlling one. A closed descriptor, with errno,
-// where it cannot be opened.
+// lead on the host, also absolute ones of a host that lies in a folder. No terminal becomes the
+// controlling one. A closed descriptor, with errno, where it cannot be opened.
 FileDescriptor OpenInImage(const HostImage& image, const std::string& path, int flags);
 
 // What lies at a path of the host.
@@ -33,7 +36,8 @@ struct ImageFile {
     std::string content;    // of a regular file, at most as much as was asked for
 };
 
-// Never blocks. Reads at most `limit` bytes of a regular file. Throws std::bad_alloc.
+// Never blocks. Reads at most `limit` bytes of a regular file, which counts as read then
+// (image/ReadFiles.h). Throws std::bad_alloc.
 ImageFile ReadImageFile(const HostImage& image, const std::string& path,
                         std::size_t limit = static_cast<std::size_t>(-1));
 

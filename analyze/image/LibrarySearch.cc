@@ -45,43 +45,86 @@ LibrarySearch::LibrarySearch(const HostImage& hostImage, const Architecture& boo
     defaultFolders = folder.empty() ? "/lib:/usr/lib"
                                     : "/lib/" + folder + ":/usr/lib/" + folder + ":/lib:/usr/lib";
     libraryFolder = folder.empty() ? "lib" : "lib/" + folder;
+    if (boot.machine == EM_X86_64) {
+        for (const char* const level : {"v4", "v3", "v2"}) {
+            variants.push_back(std::string("glibc-hwcaps/x86-64-") + level + "/");
+        }
+    }
 }
 
+void LibrarySearch::SetProgram(const std::string& path, const Linkage& linkage) {
+    programPath = path;
+    programFolders = linkage.inheritedPath;
+}
+
+// One that cannot be read here will do: the linker, which is root's, can.
 bool LibrarySearch::IsLibrary(const std::string& path) const {
     const ImageFile file = ReadImageFile(image, path, architectureBytes);
-    return file.kind == ImageFile::Kind::Regular && ArchitectureOf(file.content) == boot;
+    return file.kind == ImageFile::Kind::Unreadable ||
+           (file.kind == ImageFile::Kind::Regular && ArchitectureOf(file.content) == boot);
 }
 
-std::string LibrarySearch::FindIn(const std::string& searchPath, const std::string& name,
+std::string LibrarySearch::Expand(const std::string& text, const std::string& objectPath) const {
+    std::string expanded = text;
+    const std::string origin = objectPath.substr(0, objectPath.find_last_of('/'));
+    for (const char* const spelling : {"$ORIGIN", "${ORIGIN}"}) {
+        ReplaceAll(expanded, spelling, origin);
+    }
+    for (const char* const spelling : {"$LIB", "${LIB}"}) {
+        ReplaceAll(expanded, spelling, libraryFolder);
+    }
+    return expanded;
+}
+
+std::string LibrarySearch::FindIn(const std::string& folders, const std::string& name,
                                   const std::string& objectPath) const {
-    std::istringstream folders(searchPath);
-    for (std::string folder; std::getline(folders, folder, ':');) {
-        const std::string origin = objectPath.substr(0, objectPath.find_last_of('/'));
-        for (const char* const spelling : {"$ORIGIN", "${ORIGIN}"}) {
-            ReplaceAll(folder, spelling, origin);
+    std::istringstream rest(Expand(folders, objectPath));
+    for (std::string folder; std::getline(rest, folder, ':');) {
+        if (folder.empty()) {
+            continue;
         }
-        for (const char* const spelling : {"$LIB", "${LIB}"}) {
-            ReplaceAll(folder, spelling, libraryFolder);
+        folder += '/';
+        if (IsLibrary(folder + name)) {
+            return folder + name;
         }
-        if (!folder.empty() && IsLibrary(folder.append("/").append(name))) {
-            return folder;
+        for (const std::string& variant : variants) {
+            std::string path = folder;
+            path.append(variant).append(name);
+            if (IsLibrary(path)) {
+                return path;
+            }
         }
     }
     return {};
 }
 
-std::string LibrarySearch::Find(const std::string& name, const std::string& path,
-                                const Linkage& linkage) const {
+// An object that names folders for itself alone asks nobody else; such a one also hands none on.
+std::string LibrarySearch::FindAlongChain(const std::string& name,
+                                          const std::vector<Requirer>& chain) const {
+    const Requirer& first = chain.front();
+    if (!first.linkage->runPath.empty()) {
+        return FindIn(first.linkage->runPath, name, *first.path);
+    }
+    for (const Requirer& one : chain) {
+        const std::string found = FindIn(one.linkage->inheritedPath, name, *one.path);
+        if (!found.empty()) {
+            return found;
+        }
+    }
+    return FindIn(programFolders, name, programPath);
+}
+
+std::string LibrarySearch::Find(const std::string& name, const std::vector<Requirer>& chain) const {
+    const Requirer& first = chain.front();
     if (name.find('/') != std::string::npos) {
-        return IsLibrary(name) ? name : std::string();
+        // The boot's working folder is the host's root.
+        std::string path = Expand(name, *first.path);
+        if (path.front() != '/') {
+            path.insert(0, "/");
+        }
+        return IsLibrary(path) ? path : std::string();
     }
-    std::string found;
-    if (linkage.runPath.empty()) {
-        found = FindIn(linkage.inheritedPath, name, path);
-        found = found.empty() ? FindIn(inherited, name, HostImage::program) : found;
-    } else {
-        found = FindIn(linkage.runPath, name, path);
-    }
+    std::string found = FindAlongChain(name, chain);
     if (!found.empty()) {
         return found;
     }
@@ -91,7 +134,8 @@ std::string LibrarySearch::Find(const std::string& name, const std::string& path
     if (fits != cached.end()) {
         return *fits;
     }
-    return linkage.searchesDefaultFolders ? FindIn(defaultFolders, name, path) : std::string();
+    return first.linkage->searchesDefaultFolders ? FindIn(defaultFolders, name, *first.path)
+                                                 : std::string();
 }
 
 }  // namespace vantor::analyze

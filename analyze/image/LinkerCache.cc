@@ -10,6 +10,7 @@ namespace vantor::analyze {
 namespace {
 
 constexpr std::string_view magic = "glibc-ld.so.cache1.1";
+constexpr std::string_view olderMagic = "ld.so-1.7.0";
 
 // The header, and the offsets in it and in an entry.
 constexpr std::uint64_t countOffset = 20;
@@ -21,11 +22,16 @@ constexpr std::uint64_t processorOffset = 16;
 
 }  // namespace
 
-LinkerCache::LinkerCache(const std::string& content, unsigned char byteOrder) {
-    if (content.compare(0, magic.size(), magic) != 0) {
+LinkerCache::LinkerCache(const std::string& file, unsigned char byteOrder) {
+    const std::size_t begin = file.find(magic);
+    const bool isFirst = begin == 0;
+    if (begin == std::string::npos ||
+        (!isFirst && file.compare(0, olderMagic.size(), olderMagic) != 0)) {
         return;
     }
+    const std::string content = file.substr(begin);  // places are counted from here
     const ElfBytes bytes(content, byteOrder);
+    std::map<std::string, std::vector<std::string>> ofSingleKinds;
     const auto text = [&](std::uint64_t place) {
         const std::uint64_t start = bytes.Number(place, 4).value_or(content.size());
         const std::size_t end = start < content.size()
@@ -40,11 +46,14 @@ LinkerCache::LinkerCache(const std::string& content, unsigned char byteOrder) {
         const std::uint64_t entry = headerSize + i * entrySize;
         const auto processor = bytes.Number(entry + processorOffset, 8);
         if (!processor) {
-            return;
+            break;
         }
-        if (*processor == 0) {
-            entries[text(entry + nameOffset)].push_back(text(entry + pathOffset));
-        }
+        (*processor == 0 ? entries : ofSingleKinds)[text(entry + nameOffset)].push_back(
+            text(entry + pathOffset));
+    }
+    for (const auto& [name, paths] : ofSingleKinds) {
+        std::vector<std::string>& all = entries[name];
+        all.insert(all.end(), paths.begin(), paths.end());
     }
 }
 

@@ -7,9 +7,8 @@
 
 namespace vantor::analyze {
 
-// The dynamic linker's cache of a host, as ldconfig(8) writes it since the GNU C library 2.2: which
-// files there are of a library's name. Entries for single kinds of processor are left out: each is
-// there beside one for all.
+// The dynamic linker's cache of a host, as ldconfig(8) writes it since the GNU C library 2.2, also
+// behind a table of the older kind: which files there are of a library's name.
 class LinkerCache {
 public:
     static constexpr const char* path = "/etc/ld.so.cache";
@@ -18,7 +17,8 @@ public:
     // those before the damage.
     LinkerCache(const std::string& content, unsigned char byteOrder);
 
-    // Paths of the host, in the linker's order; of all word sizes.
+    // Paths of the host, of all word sizes: those for all processors in the linker's order, and
+    // behind them those for single kinds.
     const std::vector<std::string>& Find(const std::string& name) const;
 
 private:

@@ -30,18 +30,17 @@ struct HeaderLayout {
         offset = narrow ? offsetof(Elf32_Phdr, p_offset) : offsetof(Elf64_Phdr, p_offset);
         address = narrow ? offsetof(Elf32_Phdr, p_vaddr) : offsetof(Elf64_Phdr, p_vaddr);
         fileSize = narrow ? offsetof(Elf32_Phdr, p_filesz) : offsetof(Elf64_Phdr, p_filesz);
-        alignment = narrow ? offsetof(Elf32_Phdr, p_align) : offsetof(Elf64_Phdr, p_align);
     }
 
     std::size_t word;
     std::size_t segmentHeader;
-    std::size_t version, segments, entrySize, count;   // of the file's header
-    std::size_t offset, address, fileSize, alignment;  // of a segment's header
+    std::size_t version, segments, entrySize, count;  // of the file's header
+    std::size_t offset, address, fileSize;            // of a segment's header
 };
 
 // One segment, as far as the linker checks it.
 struct SegmentHeader {
-    std::uint64_t type, offset, address, fileSize, alignment;
+    std::uint64_t type, offset, address, fileSize;
 };
 
 // Reads headers of the boot's architecture, which the file may lack or have otherwise.
@@ -136,8 +135,7 @@ bool Examination::ReadSegment(std::uint64_t index, SegmentHeader& segment) const
     const std::uint64_t start = table + index * size;
     segment = {Number(start, 4), Number(start + layout.offset, layout.word),
                Number(start + layout.address, layout.word),
-               Number(start + layout.fileSize, layout.word),
-               Number(start + layout.alignment, layout.word)};
+               Number(start + layout.fileSize, layout.word)};
     return true;
 }
 

@@ -51,6 +51,7 @@ public:
         : object(sharedObject),
           file(object.File()),
           layout(file.WordSize()),
+          versions(sharedObject),
           reading(result),
           textLeft(4 * file.FileSize() + 65536) {}
 
@@ -59,9 +60,12 @@ public:
     void ReadMetadata(std::uint64_t address);
     // Returns whether there is a start entry.
     bool ReadOperations(std::uint64_t address);
+    // What only loading can find.
+    const std::vector<std::string>& Elsewhere() const { return elsewhere; }
 
 private:
     LoadedPointer Field(std::uint64_t address, const std::string& what);
+    void NoteShared(const LoadedPointer& pointer, const std::string& what);
     std::vector<std::string> Names(std::uint64_t field, const std::string& what);
     std::vector<BarrierName> Barriers(std::uint64_t field, const std::string& what);
     std::set<std::string> Flags(std::uint64_t field, const std::string& what);
@@ -70,8 +74,10 @@ private:
     const SharedObject& object;
     const ElfFile& file;
     const MetadataLayout layout;
+    const SymbolVersions versions;
     NativeReading& reading;
-    std::uint64_t textLeft;  // as much as no honest record names; keeps the time linear
+    std::vector<std::string> elsewhere;  // what lies in other objects
+    std::uint64_t textLeft;              // as much as no honest record names; keeps the time linear
 };
 
 std::int32_t RecordReader::Version(std::uint64_t address) const {
@@ -113,9 +119,7 @@ bool RecordReader::ReadOperations(std::uint64_t address) {
         if (pointer->kind == LoadedPointer::Kind::Inside && !file.Number(pointer->address, 1)) {
             throw BadRecord(what + " points out of the file");
         }
-        if (!pointer->symbol.empty()) {
-            reading.sharedParts.push_back({what, std::string(pointer->symbol)});
-        }
+        NoteShared(*pointer, what);
         return pointer->kind != LoadedPointer::Kind::Null;
     };
     const bool starts = entry(address, "the start entry");
@@ -132,12 +136,18 @@ LoadedPointer RecordReader::Field(std::uint64_t address, const std::string& what
         throw BadRecord(what + noPointer);
     }
     if (pointer->kind == LoadedPointer::Kind::Outside) {
-        throw BadRecord(what + " lies in another object, which only loading can find");
+        elsewhere.push_back(what);
+        return {};
     }
-    if (!pointer->symbol.empty()) {
-        reading.sharedParts.push_back({what, std::string(pointer->symbol)});
-    }
+    NoteShared(*pointer, what);
     return *pointer;
+}
+
+void RecordReader::NoteShared(const LoadedPointer& pointer, const std::string& what) {
+    if (pointer.kind == LoadedPointer::Kind::Inside && !pointer.symbol.empty()) {
+        reading.sharedParts.push_back(
+            {what, {std::string(pointer.symbol), versions.NameOf(pointer.version)}});
+    }
 }
 
 std::vector<std::string> RecordReader::Names(std::uint64_t field, const std::string& what) {
@@ -156,7 +166,8 @@ std::vector<std::string> RecordReader::Names(std::uint64_t field, const std::str
             return names;
         }
         if (item->kind == LoadedPointer::Kind::Outside) {
-            throw BadRecord(what + " has a name that lies in another object");
+            elsewhere.push_back("a name in " + what);
+            continue;
         }
         names.push_back(Text(item->address, what));
     }
@@ -213,7 +224,10 @@ private:
     }
     bool MayBeOpened(const ElfFile& file);
     bool PassesLinker(const std::string& content, const Architecture& boot);
-    const SharedObject::Symbol* Find(const SharedObject& object, const std::string& name);
+    // Null where a library of the plugin's own has it; empty where it is rejected.
+    std::optional<const SharedObject::Symbol*> Find(const SharedObject& object,
+                                                    const std::string& name);
+    void TellUndetermined(const std::string& what);
     bool ReadRecords(const SharedObject& object);
     void CheckSize(const SharedObject::Symbol& record, std::uint64_t needed);
 
@@ -260,9 +274,12 @@ bool NativeReader::MayBeOpened(const ElfFile& file) {
     return true;
 }
 
-const SharedObject::Symbol* NativeReader::Find(const SharedObject& object,
-                                               const std::string& name) {
+std::optional<const SharedObject::Symbol*> NativeReader::Find(const SharedObject& object,
+                                                              const std::string& name) {
     const SharedObject::Symbol* const symbol = object.Find(name);
+    if (symbol == nullptr && scope != nullptr && scope->LibrariesDefine(reading.opened, name)) {
+        return symbol;
+    }
     if (symbol == nullptr) {
         Reject("rejected", source.bootPath + ": undefined symbol: " + name);
     } else if (symbol->address == 0) {
@@ -270,7 +287,7 @@ const SharedObject::Symbol* NativeReader::Find(const SharedObject& object,
     } else {
         return symbol;
     }
-    return nullptr;
+    return std::nullopt;
 }
 
 void NativeReader::CheckSize(const SharedObject::Symbol& record, std::uint64_t needed) {
@@ -282,21 +299,38 @@ void NativeReader::CheckSize(const SharedObject::Symbol& record, std::uint64_t n
     }
 }
 
+void NativeReader::TellUndetermined(const std::string& what) {
+    Report(Severity::Warning, "undetermined",
+           what + ": only loading the plugin tells what it says there, so that is not looked at");
+}
+
 bool NativeReader::ReadRecords(const SharedObject& object) {
-    const SharedObject::Symbol* const operations = Find(object, "operations");
-    const SharedObject::Symbol* const metadata =
-        operations == nullptr ? nullptr : Find(object, "metadata");
-    if (metadata == nullptr) {
+    const auto foundOperations = Find(object, "operations");
+    const auto foundMetadata = foundOperations ? Find(object, "metadata") : std::nullopt;
+    if (!foundMetadata) {
         return false;
+    }
+    const SharedObject::Symbol* const operations = *foundOperations;
+    const SharedObject::Symbol* const metadata = *foundMetadata;
+    if (operations == nullptr || metadata == nullptr) {
+        TellUndetermined("a record of the plugin lies in a library that it brings with it");
+        return true;
     }
     RecordReader records(object, reading);
     const std::int32_t version = records.Version(metadata->address);
+    if (version == 0 && object.File().IsZeroFilled(metadata->address)) {
+        TellUndetermined("the record \"metadata\" is written while the plugin is loaded, or never");
+        return true;
+    }
     if (version < oldestVersion || version > newestVersion) {
         Reject("unsupported-version", "Unsupported API version");
         return false;
     }
     records.ReadMetadata(metadata->address);
     const bool starts = records.ReadOperations(operations->address);
+    if (!records.Elsewhere().empty()) {
+        TellUndetermined(records.Elsewhere().front() + " lies in another object");
+    }
     if (!starts) {
         Report(Severity::Warning, "null-start", "the start entry is null: the boot runs nothing");
     }
@@ -319,13 +353,10 @@ std::optional<NativeReading> NativeReader::Read(const std::string& content,
         }
         const SharedObject object(file);
         if (scope != nullptr) {
-            scope->Open(source, ReadLinkage(object));
+            reading.opened = scope->Open(source, Linkage(object));
         }
         if (!ReadRecords(object)) {
             return std::nullopt;
-        }
-        for (const SharedObject::Symbol& symbol : object.Exports()) {
-            reading.exports.emplace_back(symbol.name);
         }
         return std::move(reading);
     } catch (const ElfError& error) {

@@ -58,15 +58,15 @@ void Ownership::Check(const std::string& path, const struct stat& status,
 
 void Ownership::CheckFoldersOf(const std::string& path, Findings& findings) {
     bool innermost = true;
-    for (std::string folder = FolderOf(path); !folder.empty(); folder = FolderOf(folder)) {
+    // Above one that has been checked all have been.
+    for (std::string folder = FolderOf(path); !folder.empty() && checked.insert(folder).second;
+         folder = FolderOf(folder)) {
         struct stat status {};
         if (StatusOf(image, folder, status)) {
             if (!innermost && (status.st_mode & S_ISVTX) != 0) {
                 status.st_mode &= ~static_cast<mode_t>(S_IWGRP | S_IWOTH);
             }
-            if (checked.insert(folder).second) {
-                Check(folder, status, findings);
-            }
+            Check(folder, status, findings);
         }
         innermost = false;
     }

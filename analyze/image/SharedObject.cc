@@ -53,15 +53,15 @@ void SharedObject::ReadSymbols() {
     for (std::uint64_t i = 0; i < symbolCount; ++i) {
         GElf_Sym symbol;
         if (gelf_getsym(symbols, static_cast<int>(i), &symbol) != nullptr && IsExported(symbol)) {
-            AddExport(symbol);
+            AddExport(symbol, i);
         }
     }
 }
 
-void SharedObject::AddExport(const GElf_Sym& symbol) {
+void SharedObject::AddExport(const GElf_Sym& symbol, std::uint64_t symbolIndex) {
     const std::string_view name = NameAt(symbol.st_name);
     if (!name.empty()) {
-        exports.push_back({name, symbol.st_value, symbol.st_size});
+        exports.push_back({name, symbol.st_value, symbol.st_size, VersionEntry(symbolIndex)});
     }
 }
 
@@ -161,8 +161,17 @@ void SharedObject::AddImport(std::uint32_t symbolIndex, bool atLoad) {
     }
     const std::string_view name = NameAt(symbol.st_name);
     if (!name.empty()) {
-        imports.push_back({name, atLoad});
+        imports.push_back({name, atLoad, VersionEntry(symbolIndex)});
     }
+}
+
+// Without a table of versions every symbol is one of the object as a whole.
+std::uint16_t SharedObject::VersionEntry(std::uint64_t symbolIndex) const {
+    constexpr std::uint64_t ofTheWhole = VER_NDX_GLOBAL;
+    const std::optional<std::uint64_t> table = file.Dynamic(DT_VERSYM);
+    const std::optional<std::uint64_t> entry =
+        table ? file.Number(*table + 2 * symbolIndex, 2) : std::nullopt;
+    return static_cast<std::uint16_t>(entry.value_or(ofTheWhole));
 }
 
 bool SharedObject::BindsAtLoad() const {
@@ -263,12 +272,14 @@ std::optional<LoadedPointer> SharedObject::ToSymbol(const Relocation& relocation
         return std::nullopt;
     }
     if (symbol.st_shndx == SHN_UNDEF || GELF_ST_TYPE(symbol.st_info) == STT_GNU_IFUNC) {
-        return LoadedPointer{LoadedPointer::Kind::Outside, 0, {}};
+        return LoadedPointer{LoadedPointer::Kind::Outside, 0, NameAt(symbol.st_name),
+                             VersionEntry(relocation.symbol)};
     }
     const bool shared = IsExported(symbol) && !looksInItselfFirst &&
                         GELF_ST_VISIBILITY(symbol.st_other) == STV_DEFAULT;
     return LoadedPointer{LoadedPointer::Kind::Inside, Wrapped(symbol.st_value + addend),
-                         shared ? NameAt(symbol.st_name) : std::string_view()};
+                         shared ? NameAt(symbol.st_name) : std::string_view(),
+                         VersionEntry(relocation.symbol)};
 }
 
 }  // namespace vantor::analyze

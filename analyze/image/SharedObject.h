@@ -22,8 +22,9 @@ struct LoadedPointer {
     Kind kind = Kind::Null;
     std::uint64_t address = 0;
     // The exported symbol that the linker looks up for it, in all loaded objects; empty when it
-    // looks up none, or only in this object.
+    // looks up none, or only in this object. For one outside, the symbol of that object.
     std::string_view symbol;
+    std::uint16_t version = 0;  // its entry in the table of versions
 };
 
 // The exported symbols of a shared object and its data with the dynamic relocations applied, of
@@ -37,7 +38,8 @@ public:
     struct Symbol {
         std::string_view name;
         std::uint64_t address;
-        std::uint64_t size;  // 0: the object does not say
+        std::uint64_t size;     // 0: the object does not say
+        std::uint16_t version;  // its entry in the table of versions (image/SymbolVersions.h)
     };
 
     // What dlsym(3) finds in the object, in the order of its table.
@@ -48,6 +50,7 @@ public:
     struct Import {
         std::string_view name;
         bool atLoad;  // else a lazy linker looks for it when the function is first called
+        std::uint16_t version;
     };
 
     // Each once, in the order in which the linker looks for them.
@@ -74,7 +77,8 @@ private:
     void ReadSymbols();
     std::uint64_t CountSymbols() const;
     std::uint64_t CountHashedSymbols(std::uint64_t hash) const;
-    void AddExport(const GElf_Sym& symbol);
+    void AddExport(const GElf_Sym& symbol, std::uint64_t symbolIndex);
+    std::uint16_t VersionEntry(std::uint64_t symbolIndex) const;
     void ReadRelocations(std::int64_t tableTag, std::int64_t sizeTag, bool withAddends);
     void AddImport(std::uint32_t symbolIndex, bool atLoad);
     bool BindsAtLoad() const;

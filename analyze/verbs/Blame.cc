@@ -9,6 +9,7 @@
 #include "boot/BootTimeline.h"
 #include "verbs/BootOutput.h"
 #include "verbs/TextTable.h"
+#include "verify/Wording.h"
 
 namespace vantor::analyze {
 
@@ -18,7 +19,7 @@ void WriteBlame(const BootTimeline& timeline, const Invocation& invocation) {
     using Kind = TextTable::Kind;
     invocation.out << fmt::format(
         "{} on {}: {} ms from the first start to the last end, {} ms of work; all times in ms\n",
-        Count(timeline.entries.size(), "plugin"), Count(timeline.workers, "worker"),
+        Counted(timeline.entries.size(), "plugin"), Counted(timeline.workers, "worker"),
         Milliseconds(timeline.Makespan()), Milliseconds(timeline.Work()));
     TextTable table({{"PLUGIN", Kind::Name},
                      {"FOR BARRIERS", Kind::Number},

@@ -3,7 +3,7 @@
 #include <memory>
 
 #include "verbs/CommonOptions.h"
-#include "verbs/TextTable.h"
+#include "verify/Wording.h"
 
 namespace vantor::analyze {
 
@@ -20,7 +20,7 @@ void WriteJson(const Json& document, std::ostream& stream) {
 
 void TellRemarks(const std::vector<std::string>& remarks, const Invocation& invocation) {
     for (const std::string& remark : remarks) {
-        invocation.error << "note: " << OneLine(remark) << '\n';
+        invocation.error << "note: " << OnOneLine(remark) << '\n';
     }
 }
 
@@ -36,7 +36,7 @@ void AddReportVerb(CLI::App& app, Invocation& invocation, const std::string& nam
     AddFormatOption(*verb, options->format);
     verb->callback([options, report, &invocation] {
         invocation.action = [options, report, &invocation] {
-            const BootTimeline timeline = options->source.Read();
+            const BootTimeline timeline = options->source.Read(invocation);
             if (options->format == "json") {
                 WriteJson(report.document(timeline), invocation.out);
             } else {
@@ -46,10 +46,6 @@ void AddReportVerb(CLI::App& app, Invocation& invocation, const std::string& nam
             return statusClean;
         };
     });
-}
-
-std::string Count(std::size_t count, const std::string& what) {
-    return std::to_string(count) + " " + what + (count == 1 ? "" : "s");
 }
 
 }  // namespace vantor::analyze

@@ -36,9 +36,6 @@ struct BootReport {
 void AddReportVerb(CLI::App& app, Invocation& invocation, const std::string& name,
                    const std::string& description, const BootReport& report);
 
-// "1 worker", "8 workers".
-std::string Count(std::size_t count, const std::string& what);
-
 }  // namespace vantor::analyze
 
 #endif

@@ -9,6 +9,7 @@
 #include "boot/CriticalChain.h"
 #include "verbs/BootOutput.h"
 #include "verbs/TextTable.h"
+#include "verify/Wording.h"
 
 namespace vantor::analyze {
 
@@ -55,7 +56,7 @@ void WriteChain(const BootTimeline& timeline, const Invocation& invocation) {
     }
     invocation.out << fmt::format(
         "{} of {} decided when the boot ended: they ran for {} of {} ms; all times in ms\n",
-        chain.size(), Count(timeline.entries.size(), "plugin"), Milliseconds(ran),
+        chain.size(), Counted(timeline.entries.size(), "plugin"), Milliseconds(ran),
         Milliseconds(timeline.Makespan()));
     table.Write(invocation.out, invocation.width);
 }

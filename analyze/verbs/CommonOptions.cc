@@ -8,6 +8,7 @@
 #include "boot/DotModel.h"
 #include "boot/InputText.h"
 #include "image/ImageFile.h"
+#include "verbs/Progress.h"
 #include "verify/Report.h"
 #include "verify/Wording.h"
 
@@ -107,7 +108,10 @@ BootLog LogSource::ReadLog() const {
     }
     const HostImage image = plugins.Image();
     const std::string path = image.Open(HostImage::profilingLog);
-    const ImageFile file = ReadImageFile(image, HostImage::profilingLog, longestInput);
+    const ImageFile file = ReadImageFile(image, HostImage::profilingLog, longestInput + 1);
+    if (file.content.size() > longestInput) {
+        ThrowTooLong(path, longestInput);
+    }
     switch (file.kind) {
     case ImageFile::Kind::Missing:
     case ImageFile::Kind::Unreadable:
@@ -128,16 +132,17 @@ BootModel LogSource::ReadModel(std::vector<std::string>& remarks) const {
                        : ReadDotModel(dot);
 }
 
+BootTimeline LogSource::Read(const Invocation& invocation) const {
+    const Progress progress(invocation, "reading the boot");
+    return Read();
+}
+
 BootTimeline LogSource::Read() const {
     const BootLog read = ReadLog();
     std::vector<std::string> remarks;
     BootTimeline timeline = MakeTimeline(read, ReadModel(remarks));
     timeline.remarks.insert(timeline.remarks.end(), remarks.begin(), remarks.end());
     return timeline;
-}
-
-std::vector<std::string> LogSource::Inputs() const {
-    return {log.empty() ? plugins.Image().Open(HostImage::profilingLog) : log, dot};
 }
 
 CLI::Validator HasName() {
@@ -149,7 +154,8 @@ CLI::Validator HasName() {
 }
 
 void AddLogOptions(CLI::App& verb, LogSource& source) {
-    verb.add_option("LOG", source.log, "The profiling log; the host's own without it");
+    verb.add_option("LOG", source.log, "The profiling log; the host's own without it")
+        ->check(HasName());
     verb.add_option("--dot", source.dot,
                     "Take the barriers from this drawing of vantor --dump-dependency-tree")
         ->type_name("FILE")

@@ -45,9 +45,8 @@ struct LogSource {
     // directory that is not there, when none was asked for. Throws std::runtime_error or
     // std::system_error when the log, or what was asked for, cannot be read.
     BootTimeline Read() const;
-
-    // The files of this machine that it reads, as far as they are named.
-    std::vector<std::string> Inputs() const;
+    // The same, with a line on a terminal when it takes long.
+    BootTimeline Read(const Invocation& invocation) const;
 
 private:
     BootLog ReadLog() const;

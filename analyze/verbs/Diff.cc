@@ -19,7 +19,9 @@
 #include "boot/DotModel.h"
 #include "verbs/BootOutput.h"
 #include "verbs/CommonOptions.h"
+#include "verbs/Progress.h"
 #include "verbs/TextTable.h"
+#include "verify/Wording.h"
 
 namespace vantor::analyze {
 
@@ -116,7 +118,7 @@ std::string GrowthText(const Change& change) {
 }
 
 std::string NameList(const std::vector<std::string>& names) {
-    return names.empty() ? "none" : OneLine(fmt::format("{}", fmt::join(names, ", ")));
+    return names.empty() ? "none" : OnOneLine(fmt::format("{}", fmt::join(names, ", ")));
 }
 
 void WriteTable(const Comparison& comparison, const Invocation& invocation) {
@@ -154,14 +156,14 @@ void WriteText(const Result& result, const Invocation& invocation) {
     invocation.out << fmt::format(
         "{} before, {} after; all times in ms, medians where there are several\n"
         "total: {} before, {} after, {} ({}), {}\n",
-        Count(comparison.boots[0], "boot"), Count(comparison.boots[1], "boot"),
+        Counted(comparison.boots[0], "boot"), Counted(comparison.boots[1], "boot"),
         Milliseconds(total.before), Milliseconds(total.after), Signed(total.Difference()),
         GrowthText(total),
         total.IsSlower()   ? "slower"
         : total.IsFaster() ? "faster"
                            : "within the noise of " + Milliseconds(total.noise));
     WriteTable(comparison, invocation);
-    invocation.out << fmt::format("unchanged: {}\n", Count(comparison.unchanged, "plugin"));
+    invocation.out << fmt::format("unchanged: {}\n", Counted(comparison.unchanged, "plugin"));
     if (!result.chain) {
         invocation.out << "critical chain: not compared, as the plugins are not there "
                           "(--directory, --dot)\n";
@@ -211,7 +213,7 @@ Json Document(const Result& result) {
     return document;
 }
 
-int Run(const DiffOptions& options, const Invocation& invocation) {
+Result CompareSides(const DiffOptions& options, const Invocation& invocation) {
     std::vector<std::string> oldPaths = options.before;
     std::vector<std::string> newPaths = options.after;
     if (options.pair.size() == 2 && oldPaths.empty() && newPaths.empty()) {
@@ -221,12 +223,18 @@ int Run(const DiffOptions& options, const Invocation& invocation) {
         throw std::runtime_error("diff takes two logs, OLD and NEW, or one or several for each "
                                  "of --old and --new");
     }
+    const Progress progress(invocation, "comparing the boots");
     const std::vector<BootLog> before = ReadLogs(oldPaths);
     const std::vector<BootLog> after = ReadLogs(newPaths);
     const NoiseRule rule{static_cast<Microseconds>(std::llround(options.leastMilliseconds * 1000)),
                          options.marginPercent / 100};
     Result result{CompareBoots(before, after, rule), std::nullopt, {}};
     result.chain = CompareChains(options, before, after, result.remarks);
+    return result;
+}
+
+int Run(const DiffOptions& options, const Invocation& invocation) {
+    const Result result = CompareSides(options, invocation);
     if (options.format == "json") {
         WriteJson(Document(result), invocation.out);
     } else {
@@ -257,7 +265,9 @@ CLI::Validator UpTo(double most) {
 }
 
 void AddOptions(CLI::App& verb, DiffOptions& options) {
-    verb.add_option("LOGS", options.pair, "The logs of two boots: OLD NEW")->expected(0, 2);
+    verb.add_option("LOGS", options.pair, "The logs of two boots: OLD NEW")
+        ->expected(0, 2)
+        ->check(HasName());
     verb.add_option("--old", options.before, "Logs of several boots of old")->type_name("LOG...");
     verb.add_option("--new", options.after, "Logs of several new boots")->type_name("LOG...");
     AddBootOptions(verb, options.plugins, DirectoryAs::Option);

@@ -56,7 +56,7 @@ int DrawGraph(const GraphOptions& options, const Invocation& invocation) {
     if (options.output.empty()) {
         invocation.out << drawing;
     } else {
-        WriteOutput(options.output, drawing, {});
+        WriteOutput(options.output, drawing);
     }
     TellUnread(findings, invocation);
     return statusClean;

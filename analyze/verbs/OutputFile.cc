@@ -7,17 +7,45 @@
 #include <stdexcept>
 #include <system_error>
 
+#include "image/ReadFiles.h"
+#include "io/afstream.h"
 #include "verbs/CommonOptions.h"
 
 namespace vantor::analyze {
 
 namespace {
 
-bool IsSameFile(const std::string& one, const std::string& other) {
-    struct stat first {};
-    struct stat second {};
-    return stat(one.c_str(), &first) == 0 && stat(other.c_str(), &second) == 0 &&
-           S_ISREG(first.st_mode) && first.st_dev == second.st_dev && first.st_ino == second.st_ino;
+[[noreturn]] void Fail(const std::string& path, int error) {
+    throw std::runtime_error(path +
+                             ": cannot be written: " + std::generic_category().message(error));
+}
+
+bool IsRegular(const std::string& path) {
+    struct stat status {};
+    return lstat(path.c_str(), &status) == 0 && S_ISREG(status.st_mode);
+}
+
+void Replace(const std::string& path, const std::string& result) {
+    afstream file;
+    errno = 0;
+    try {
+        file.open(path.c_str(), std::ios::binary | std::ios::out);
+        file << result;
+        file.commit();
+    } catch (const std::runtime_error&) {
+        Fail(path, errno);
+    }
+}
+
+// Something new, a device, a pipe, or what a link leads to.
+void WriteInto(const std::string& path, const std::string& result) {
+    errno = 0;
+    std::ofstream file(path, std::ios::binary | std::ios::trunc);
+    file << result;
+    file.close();
+    if (!file) {
+        Fail(path, errno);
+    }
 }
 
 }  // namespace
@@ -28,19 +56,14 @@ void AddOutputOption(CLI::App& verb, std::string& path) {
         ->check(HasName());
 }
 
-void WriteOutput(const std::string& path, const std::string& result,
-                 const std::vector<std::string>& inputs) {
-    for (const std::string& input : inputs) {
-        if (IsSameFile(path, input)) {
-            throw std::runtime_error(path + ": is what the result is made from, not overwritten");
-        }
+void WriteOutput(const std::string& path, const std::string& result) {
+    if (WasRead(path)) {
+        throw std::runtime_error(path + ": is what the result is made from, not overwritten");
     }
-    errno = 0;
-    std::ofstream file(path, std::ios::binary | std::ios::trunc);
-    file << result;
-    file.close();
-    if (!file) {
-        throw std::system_error(errno, std::generic_category(), path + ": cannot be written");
+    if (IsRegular(path)) {
+        Replace(path, result);
+    } else {
+        WriteInto(path, result);
     }
 }
 

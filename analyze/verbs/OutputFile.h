@@ -3,18 +3,16 @@
 
 #include <CLI/CLI.hpp>
 #include <string>
-#include <vector>
 
 namespace vantor::analyze {
 
 // --output=FILE, which has a name; empty without the option.
 void AddOutputOption(CLI::App& verb, std::string& path);
 
-// Writes a result to a file, which is none of the files it was made from. Throws std::runtime_error
-// that names `path` when it is one of `inputs` all the same, and std::system_error when it cannot
-// be written; an input is never touched.
-void WriteOutput(const std::string& path, const std::string& result,
-                 const std::vector<std::string>& inputs);
+// Writes a result to a file that has not been read to make it. A file that is there is replaced as
+// a whole or stays as it was. Throws std::runtime_error that names `path` when it has been read, or
+// cannot be written.
+void WriteOutput(const std::string& path, const std::string& result);
 
 }  // namespace vantor::analyze
 

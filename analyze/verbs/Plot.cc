@@ -53,7 +53,7 @@ int Run(const PlotOptions& options, const Invocation& invocation) {
     if (options.output.empty()) {
         invocation.out << chart;
     } else {
-        WriteOutput(options.output, chart, options.source.Inputs());
+        WriteOutput(options.output, chart);
     }
     TellRemarks(FirstRemarks(timeline), invocation);
     return statusClean;

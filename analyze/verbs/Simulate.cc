@@ -13,7 +13,9 @@
 #include "boot/Simulation.h"
 #include "verbs/BootOutput.h"
 #include "verbs/CommonOptions.h"
+#include "verbs/Progress.h"
 #include "verbs/TextTable.h"
+#include "verify/Wording.h"
 
 namespace vantor::analyze {
 
@@ -48,7 +50,7 @@ void WriteText(const BootTimeline& timeline, const std::vector<Prediction>& pred
     const Prediction& first = predictions.front();
     invocation.out << fmt::format(
         "measured with {}: {} ms; simulated: {} ms of work, longest chain {} ms; all times in ms\n",
-        Count(timeline.workers, "worker"), Milliseconds(timeline.Makespan()),
+        Counted(timeline.workers, "worker"), Milliseconds(timeline.Makespan()),
         Milliseconds(first.work), Milliseconds(first.criticalPath));
     TextTable table({{"WORKERS", Kind::Number},
                      {"MAKESPAN", Kind::Number},
@@ -77,8 +79,9 @@ Json Document(const BootTimeline& timeline, const std::vector<Prediction>& predi
             {"remarks", timeline.remarks}};
 }
 
-int Run(const SimulateOptions& options, const Invocation& invocation) {
-    const BootTimeline timeline = options.source.Read();
+std::vector<Prediction> Predict(const SimulateOptions& options, const BootTimeline& timeline,
+                                const Invocation& invocation) {
+    const Progress progress(invocation, "simulating the boot");
     Simulation simulation(timeline);
     for (const std::string& run : options.runs) {
         SetRun(run, simulation);
@@ -90,6 +93,12 @@ int Run(const SimulateOptions& options, const Invocation& invocation) {
     for (const std::size_t workers : options.workers) {
         predictions.push_back(simulation.Predict(workers));
     }
+    return predictions;
+}
+
+int Run(const SimulateOptions& options, const Invocation& invocation) {
+    const BootTimeline timeline = options.source.Read(invocation);
+    const std::vector<Prediction> predictions = Predict(options, timeline, invocation);
     if (options.format == "json") {
         WriteJson(Document(timeline, predictions), invocation.out);
     } else {

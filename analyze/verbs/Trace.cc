@@ -19,13 +19,13 @@ struct TraceOptions {
 };
 
 int Run(const TraceOptions& options, const Invocation& invocation) {
-    const BootTimeline timeline = options.source.Read();
+    const BootTimeline timeline = options.source.Read(invocation);
     if (options.output.empty()) {
         WriteTrace(timeline, invocation.out);
     } else {
         std::ostringstream trace;
         WriteTrace(timeline, trace);
-        WriteOutput(options.output, trace.str(), options.source.Inputs());
+        WriteOutput(options.output, trace.str());
     }
     TellRemarks(timeline.remarks, invocation);
     return statusClean;

@@ -41,6 +41,7 @@ constexpr Code codes[] = {
     {"taken-over", "Another object takes over a function, both export it by one name."},
     {"truncated", "A shared object ends before its contents do."},
     {"unchecked-objects", "What shared objects need of others cannot be checked."},
+    {"undetermined", "A native plugin says of itself only when it is loaded what it needs."},
     {"undefined-symbol", "A shared object needs a symbol that no other object defines."},
     {"unknown-command", "No command description tells of a command of a plugin."},
     {"unsupported-version", "A plugin is of a version that the boot program does not know."},

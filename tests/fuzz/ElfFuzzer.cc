@@ -18,14 +18,15 @@ using vantor::analyze::Architecture;
 using vantor::analyze::Findings;
 using vantor::analyze::NativeReading;
 
-// Whatever is not described is explained, and what is described has a version that there is.
+// Whatever is not described is explained, and what is described without a word of explanation has a
+// version that there is.
 void CheckReading(const std::string& content, const Architecture& boot) {
     Findings findings;
     const std::optional<NativeReading> reading =
         ReadNative(content, boot, {{"x.so", 0, 0}, "/x.so"}, findings);
     const bool described =
         reading && reading->plugin.apiVersion >= 1 && reading->plugin.apiVersion <= 4;
-    if (!described && (reading || findings.empty())) {
+    if (!described && findings.empty()) {
         std::fprintf(stderr, "a plugin that is neither described nor rejected\n");
         std::abort();
     }
@@ -35,7 +36,7 @@ void CheckReading(const std::string& content, const Architecture& boot) {
 void CheckLinkage(const std::string& content) {
     try {
         const vantor::analyze::ElfFile file(content);
-        const vantor::analyze::Linkage linkage = ReadLinkage(vantor::analyze::SharedObject(file));
+        const vantor::analyze::Linkage linkage{vantor::analyze::SharedObject(file)};
         if (linkage.needed.size() > content.size() ||
             linkage.requiredVersions.size() > content.size()) {
             std::fprintf(stderr, "more libraries than bytes\n");

@@ -329,6 +329,39 @@ def test_what_is_read_is_not_overwritten(analyze, boot, verb):
             assert file.read() == content
 
 
+def test_what_a_host_says_is_not_overwritten_under_another_name(analyze, root, vantor):
+    lay_out(root)
+    assert vantor("--parallel").status == 0
+    content = root.read("/var/log/sysboot.log")
+    root.write("/data/boot.log", content)
+    root.remove("/var/log/sysboot.log")
+    root.symlink("/data/boot.log", "/var/log/sysboot.log")
+    plugin = root.path("/usr/libexec/vantor/plugins/libdisks.so")
+    for verb, path in (("plot", root.path("/data/boot.log")), ("trace", plugin), ("graph", plugin)):
+        done = analyze(verb, "--root", root.folder, "--output", path)
+        assert (done.status, done.stdout) == (3, ""), verb
+        assert done.stderr.endswith(": is what the result is made from, not overwritten\n"), verb
+    assert root.read("/data/boot.log") == content
+    with open(plugin, "rb") as file:
+        assert file.read(4) == b"\x7fELF"
+
+
+def test_a_result_replaces_an_earlier_one_as_a_whole(analyze, boot, tmp_path):
+    output = tmp_path / "boot.json"
+    output.write_text("x" * 100000, encoding="utf-8")
+    os.chmod(output, 0o640)
+    assert analyze("trace", *boot, "--output", str(output)).status == 0
+    assert output.read_text(encoding="utf-8") == analyze("trace", *boot).stdout
+    assert os.stat(output).st_mode & 0o777 == 0o640
+    assert sorted(os.listdir(tmp_path)) == ["boot.json", "boot.log", "tree.dot"]
+
+
+def test_a_log_without_a_name_is_not_the_hosts(analyze):
+    done = analyze("blame", "")
+    assert (done.status, done.stdout) == (3, "")
+    assert "the file has no name" in done.stderr
+
+
 @pytest.mark.parametrize("option", ["--dot", "--output"])
 def test_a_file_without_a_name_is_refused(analyze, boot, option):
     done = analyze("trace", boot[0], f"{option}=")
@@ -336,7 +369,11 @@ def test_a_file_without_a_name_is_refused(analyze, boot, option):
     assert f"{option}: the file has no name" in done.stderr
 
 
-def test_a_verb_that_takes_long_says_so_on_a_terminal(analyze, boot, tmp_path):
+@pytest.mark.parametrize("verb, what", [
+    ("plot", b"drawing the boot"), ("blame", b"reading the boot"), ("chain", b"reading the boot"),
+    ("trace", b"reading the boot"), ("simulate", b"reading the boot"),
+    ("diff", b"comparing the boots")])
+def test_a_verb_that_takes_long_says_so_on_a_terminal(analyze, boot, tmp_path, verb, what):
     os.mkfifo(tmp_path / "slow.log")
     ours, theirs = pty.openpty()
     said = b""
@@ -351,15 +388,16 @@ def test_a_verb_that_takes_long_says_so_on_a_terminal(analyze, boot, tmp_path):
 
     writer = threading.Thread(target=write_slowly)
     writer.start()
-    done = analyze("plot", str(tmp_path / "slow.log"), *boot[1:], stderr=theirs)
+    other = boot[:1] if verb == "diff" else []
+    done = analyze(verb, str(tmp_path / "slow.log"), *other, *boot[1:], stderr=theirs)
     writer.join()
     os.close(theirs)
     rest = os.read(ours, 4096)
     os.close(ours)
     assert done.status == 0
-    assert said == b"\rdrawing the boot (1 s)"
+    assert said == b"\r" + what + b" (1 s)"
     assert rest.endswith(b"\r\x1b[K")
-    assert done.stdout.startswith("<?xml")
+    assert done.stdout != ""
 
 
 @pytest.fixture

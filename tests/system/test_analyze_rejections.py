@@ -158,6 +158,68 @@ def told_of_links(root):
              "unchecked-objects", "taken-over")]
 
 
+def versioned(root, name, version, symbol):
+    """An own library with one symbol of a version."""
+    script = root.path(f"/opt/own/{name}.map")
+    root.write(f"/opt/own/{name}.map", f"{version} {{ global: {symbol}; local: *; }};\n")
+    root.write(f"/opt/own/{name}", PluginFactory.compile(
+        f"int {symbol}(void); int {symbol}(void) {{ return 0; }}", "c", f"-Wl,-soname,{name}",
+        f"-Wl,--version-script={script}"))
+    return root.path(f"/opt/own/{name}")
+
+
+def test_a_symbol_of_a_version_that_a_library_has_lost(root, vantor):
+    library = versioned(root, "libmine.so", "OLD", "nowhere")
+    root.compiled("x", CALL_OF_NOBODY, "c", "-Wl,-z,now", "-Wl,-rpath,/opt/own", library)
+    assert told_of_links(root) == []
+    versioned(root, "libmine.so", "OLD", "elsewhere")
+    assert_foretold(root, vantor, 1)
+
+
+def test_a_library_that_a_plugin_brings_for_its_library(root, vantor):
+    deep = own_library(root, "libdeep.so", "int deep;")
+    root.write("/opt/own/libmine.so", PluginFactory.compile(
+        "int mine;", "c", "-Wl,-soname,libmine.so", "-Wl,--no-as-needed", deep))
+    root.compiled("x", NEEDY, "c", "-Wl,--no-as-needed", "-Wl,--disable-new-dtags",
+                  "-Wl,-rpath,/opt/own", root.path("/opt/own/libmine.so"))
+    assert told_of_links(root) == []
+    assert vantor().texts(WARNING) == []
+    root.compiled("x", NEEDY, "c", "-Wl,--no-as-needed", "-Wl,--enable-new-dtags",
+                  "-Wl,-rpath,/opt/own", root.path("/opt/own/libmine.so"))
+    assert_foretold(root, vantor, 1)
+
+
+def test_a_plugin_that_is_refused_defines_nothing_for_another(root, vantor):
+    root.compiled("x", CALL_OF_NOBODY)
+    root.compiled("y", DATA_OF_NOBODY.replace("int nowhere;", "int gone;").replace(
+        "&nowhere", "&gone") + "VANTOR_EXPORTED_ int nowhere(void);\n"
+        "int nowhere(void) { return 0; }\n")
+    assert sorted((one["code"], os.path.basename(one["path"])) for one in told_of_links(root)) == [
+        ("undefined-symbol", "libx.so"), ("undefined-symbol", "liby.so")]
+    assert vantor().status == 127
+
+
+def test_a_plugin_whose_lists_lie_in_a_library_is_loaded(root, vantor):
+    library = own_library(root, "libmine.so", 'const char* const needs[] = {"net", 0};')
+    root.compiled("x", NEEDY.replace("VANTOR_METADATA_1(NULL",
+                                     "extern const char* const needs[];\nVANTOR_METADATA_1(needs"),
+                  "c", "-Wl,-rpath,/opt/own", library)
+    [finding] = [one for one in verify(root) if one["severity"] != "note"]
+    assert (finding["severity"], finding["code"]) == ("warning", "undetermined")
+    assert vantor().texts(WARNING) == []
+
+
+def test_a_library_that_others_may_write_is_told(root):
+    library = own_library(root, "libmine.so", "int mine;")
+    root.compiled("x", NEEDY, "c", "-Wl,--no-as-needed", "-Wl,-rpath,/opt/own", library)
+    root.symlink("/evil/liby.so", f"{PLUGINS}/liby.so")
+    root.write("/evil/liby.so", PluginFactory.compile(NEEDY, "c"))
+    os.chmod(library, 0o666)
+    os.chmod(root.path("/evil"), 0o777)
+    assert {one["path"] for one in verify(root) if one["code"] == "writable"} == {
+        "/opt/own/libmine.so", "/evil"}
+
+
 def test_a_call_of_nobodys_function_ends_the_boot(root, vantor):
     root.compiled("x", CALL_OF_NOBODY)
     [finding] = told_of_links(root)

@@ -95,6 +95,13 @@ TEST(ComparisonTest, WhatIsListedWithoutARunIsNeitherAddedNorRemoved) {
     EXPECT_THAT(comparison.removed, IsEmpty());
 }
 
+TEST(ComparisonTest, WhatCameOrWentWithoutARunIsAddedOrRemovedToo) {
+    const Comparison comparison =
+        Compare(BootText({"a 0 1", "old idle"}), BootText({"a 0 1", "new idle"}));
+    EXPECT_THAT(comparison.added, ElementsAre("new"));
+    EXPECT_THAT(comparison.removed, ElementsAre("old"));
+}
+
 TEST(ComparisonTest, TwinsAreComparedInTheirOrder) {
     const Comparison comparison =
         Compare(BootText({"t 0 10", "t 0 100"}), BootText({"t 0 10", "t 0 500"}));

@@ -5,13 +5,12 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
-#include "analyze/image/ElfBuilder.h"
 #include "analyze/image/HostFixture.h"
 #include "image/CommandDescriptions.h"
 #include "image/DebugDescription.h"
 #include "image/ImageFile.h"
 #include "image/Ownership.h"
-#include "image/SharedNames.h"
+#include "image/ReadFiles.h"
 
 namespace vantor::analyze {
 
@@ -45,6 +44,18 @@ TEST_F(DebugDescriptionTest, AMalformedEntryIsToldInTheBootsWords) {
     EXPECT_EQ(DebugDescription(image, findings).OfConfiguration(findings).size(), 1U);
     EXPECT_THAT(Found(), ElementsAre("/etc/nuvex/vantor/debug.conf:2 warning malformed-entry: "
                                      "ignoring malformed debug entry at line 2: x:a:b"));
+}
+
+TEST_F(DebugDescriptionTest, AConfigurationThatIsNoFileIsTold) {
+    boost::filesystem::create_directories(folder.Path() + "/etc/nuvex/vantor/debug.conf");
+    DebugDescription(image, findings);
+    boost::filesystem::remove(folder.Path() + "/etc/nuvex/vantor/debug.conf");
+    ASSERT_EQ(mkfifo(folder.File("etc/nuvex/vantor/debug.conf").c_str(), 0600), 0);
+    DebugDescription(image, findings);
+    EXPECT_THAT(Found(), ElementsAre("/etc/nuvex/vantor/debug.conf:0 warning unreadable: is a "
+                                     "folder: the boot finds no entry in it",
+                                     "/etc/nuvex/vantor/debug.conf:0 error unreadable: is no "
+                                     "regular file: the boot may wait for it for ever"));
 }
 
 TEST_F(DebugDescriptionTest, WithoutAConfigurationThereAreNone) {
@@ -226,6 +237,29 @@ TEST_F(ImageFileTest, AbsoluteLinksStayInTheImage) {
     EXPECT_EQ(file.content, "inside");
 }
 
+TEST_F(ImageFileTest, ALinkLeadsWhereItLeadsOnTheHost) {
+    Write("/opt/real/x", "");
+    ASSERT_EQ(symlink("/opt/./real", folder.File("link").c_str()), 0);
+    ASSERT_EQ(symlink("../../link/x", folder.File("opt/up").c_str()), 0);
+    ASSERT_EQ(symlink("self", folder.File("self").c_str()), 0);
+    EXPECT_EQ(ResolveInImage(image, "/opt//real/../real/x"), "/opt/real/x");
+    EXPECT_EQ(ResolveInImage(image, "/link/x"), "/opt/real/x");
+    EXPECT_EQ(ResolveInImage(image, "/opt/up"), "/opt/real/x");
+    EXPECT_EQ(ResolveInImage(image, "/link/none/y"), "/opt/real/none/y");
+    EXPECT_EQ(ResolveInImage(image, "/self/x"), "/self/x");
+    EXPECT_EQ(ResolveInImage(image, "/../.."), "/");
+    EXPECT_EQ(ResolveInImage(image, "here"), "here");
+}
+
+TEST_F(ImageFileTest, WhatHasBeenReadIsKnownByAnyName) {
+    Write("/x", "text");
+    ASSERT_EQ(link(folder.File("x").c_str(), folder.File("z").c_str()), 0);
+    ReadImageFile(image, "/x");
+    EXPECT_TRUE(WasRead(folder.File("z")));
+    EXPECT_FALSE(WasRead("/proc/self/exe"));
+    EXPECT_FALSE(WasRead(folder.File("none")));
+}
+
 TEST_F(ImageFileTest, KindsAreTold) {
     ASSERT_EQ(mkfifo(folder.File("fifo").c_str(), 0600), 0);
     ASSERT_EQ(mkdir(folder.File("folder").c_str(), 0700), 0);
@@ -238,55 +272,6 @@ TEST_F(ImageFileTest, KindsAreTold) {
 TEST_F(ImageFileTest, NoMoreIsReadThanIsAskedFor) {
     Write("/x", "0123456789");
     EXPECT_EQ(ReadImageFile(image, "/x", 4).content, "0123");
-}
-
-class SharedNamesTest : public support::HostFixture {
-protected:
-    void Add(const std::string& path, const std::vector<SharedPart>& parts,
-             const std::vector<std::string>& exports) {
-        NativeReading reading;
-        reading.plugin.place.path = path;
-        reading.sharedParts = parts;
-        reading.exports = exports;
-        names.Add(reading);
-    }
-
-    SharedNames names;
-    const LinkScope scope{image, support::x86};  // of a host without a boot program
-};
-
-TEST_F(SharedNamesTest, AnEntryThatAnotherExportsTooIsToldOfEachThatLooksItUp) {
-    Add("a.so", {{"the start entry", "start"}}, {"start", "metadata"});
-    Add("b.so", {}, {"metadata", "start"});
-    Add("c.so", {{"the start entry", "begin"}}, {"begin"});
-    Add("d.so", {{"the start entry", "start"}}, {"start"});
-    names.Report(scope, findings);
-    EXPECT_THAT(Found(),
-                ElementsAre("a.so:0 error taken-over: the start entry is looked up by its "
-                            "exported name \"start\", which is exported by b.so, d.so too: "
-                            "whichever is loaded first serves all of them",
-                            "d.so:0 error taken-over: the start entry is looked up by its "
-                            "exported name \"start\", which is exported by a.so, b.so too: "
-                            "whichever is loaded first serves all of them"));
-}
-
-TEST_F(SharedNamesTest, OfManyThreeAreNamed) {
-    for (const char* const path : {"a", "b", "c", "d", "e", "f"}) {
-        Add(path, {}, {"start"});
-    }
-    Add("x", {{"the start entry", "start"}}, {"start"});
-    names.Report(scope, findings);
-    EXPECT_THAT(Found(), ElementsAre("x:0 error taken-over: the start entry is looked up by its "
-                                     "exported name \"start\", which is exported by a, b, c and "
-                                     "3 more too: whichever is loaded first serves all of them"));
-}
-
-TEST_F(SharedNamesTest, APluginThatIsNotKeptTakesNothingOver) {
-    Add("a.so", {{"the start entry", "start"}}, {"start"});
-    Add("b.so", {}, {"start"});
-    names.Forget({"b.so"});
-    names.Report(scope, findings);
-    EXPECT_THAT(Found(), IsEmpty());
 }
 
 }  // namespace

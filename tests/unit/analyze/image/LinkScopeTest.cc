@@ -4,6 +4,8 @@
 
 #include <elf.h>
 #include <gmock/gmock.h>
+#include <sys/stat.h>
+#include <unistd.h>
 
 #include "analyze/image/ElfBuilder.h"
 #include "analyze/image/HostFixture.h"
@@ -49,7 +51,7 @@ protected:
         Write("/usr/lib/" + name, Object(text));
     }
     void WritePlugin(const std::string& name, const ObjectText& text, bool isKept = true) {
-        plugins.push_back({name, Object(text), isKept});
+        plugins.push_back({name, Object(text), isKept, {0, 0}});
     }
 
     // Tells of the plugins; the paths of those that are refused.
@@ -57,22 +59,24 @@ protected:
         LinkScope scope(image, GetParam());
         for (const Plugin& plugin : plugins) {
             const ElfFile file(plugin.content);
-            const PluginSource source{{"/p/" + plugin.name, 0, 0}, "/p/" + plugin.name};
-            scope.Open(source, ReadLinkage(SharedObject(file)));
+            const PluginSource source{
+                {"/p/" + plugin.name, 0, 0}, "/p/" + plugin.name, plugin.file};
+            const std::size_t opened = scope.Open(source, Linkage(SharedObject(file)));
             if (plugin.isKept) {
-                scope.Keep(source);
+                scope.Keep(opened, parts);
             }
         }
         return scope.Report(findings);
     }
 
-private:
     struct Plugin {
         std::string name;
         std::string content;
         bool isKept;
+        std::pair<std::uint64_t, std::uint64_t> file;
     };
     std::vector<Plugin> plugins;
+    std::vector<SharedPart> parts;  // of each plugin
 };
 
 TEST_P(LinkScopeTest, WithoutABootProgramNothingIsChecked) {
@@ -180,28 +184,131 @@ TEST_P(LinkScopeTest, APluginThatIsNotKeptServesNobody) {
     EXPECT_THAT(Report(), ElementsAre("/p/a.so"));
 }
 
+TEST_P(LinkScopeTest, APluginThatIsRefusedServesNobodyHoweverLongTheChain) {
+    WriteProgram({});
+    WritePlugin("a.so", {{}, {"a"}, {"b"}, {}});
+    WritePlugin("b.so", {{}, {"b"}, {"c"}, {}});
+    WritePlugin("c.so", {{"libnone.so"}, {"c"}, {}, {}});
+    EXPECT_THAT(Report(), ElementsAre("/p/a.so", "/p/b.so", "/p/c.so"));
+    EXPECT_EQ(Found().size(), 3U);
+}
+
 TEST_P(LinkScopeTest, APluginThatIsAnothersLibraryDependsOnTheOrderToo) {
     WriteProgram({});
-    WritePlugin("a.so", {{"libb.so"}, {}, {"shared"}, {}});
+    WriteLibrary("libx.so", {{}, {"x"}, {}, {}});
+    WritePlugin("a.so", {{"libb.so", "libx.so"}, {}, {"shared", "x"}, {}});
     WritePlugin("b.so", {{}, {"shared"}, {}, "libb.so"});
     EXPECT_THAT(Report(), IsEmpty());
-    EXPECT_THAT(Found("load-order"),
+    EXPECT_THAT(Found(),
                 ElementsAre("/p/a.so:0 warning load-order: the library \"libb.so\" is that of "
-                            "/p/b.so: the boot loads this one only if the directory lists that "
-                            "one before it",
-                            "/p/a.so:0 warning load-order: the symbol \"shared\" is that of "
                             "/p/b.so: the boot loads this one only if the directory lists that "
                             "one before it"));
 }
 
-TEST_P(LinkScopeTest, TheExporterOfASymbolIsTheFirstThatTheLinkerFinds) {
-    WriteProgram({{"libx.so", "liby.so"}, {}, {}, {}});
-    WriteLibrary("libx.so", {{}, {"x", "both"}, {}, {}});
-    WriteLibrary("liby.so", {{}, {"y", "both"}, {}, {}});
-    const LinkScope scope(image, GetParam());
-    EXPECT_EQ(scope.Exporter("both"), "/usr/lib/libx.so");
-    EXPECT_EQ(scope.Exporter("y"), "/usr/lib/liby.so");
-    EXPECT_EQ(scope.Exporter("z"), "");
+TEST_P(LinkScopeTest, WhatOthersBringWithThemDependsOnTheOrder) {
+    WriteProgram({});
+    Write("/opt/liby.so", Object({{}, {"y"}, {}, "liby.so"}));
+    WritePlugin("a.so", {{"/opt/liby.so"}, {}, {}, {}});
+    WritePlugin("b.so", {{"liby.so"}, {}, {}, {}});
+    WritePlugin("c.so", {{}, {}, {"y"}, {}});
+    EXPECT_THAT(Report(), IsEmpty());
+    EXPECT_THAT(Found(),
+                ElementsAre("/p/b.so:0 warning load-order: the library \"liby.so\" is that of "
+                            "/p/a.so: the boot loads this one only if the directory lists that "
+                            "one before it",
+                            "/p/c.so:0 warning load-order: the symbol \"y\" is that of "
+                            "/opt/liby.so: the boot loads this one only if the directory lists "
+                            "that one before it"));
+}
+
+TEST_P(LinkScopeTest, APartThatAnotherExportsTooIsToldOfEach) {
+    WriteProgram({{"libc.so"}, {}, {}, {}});
+    WriteLibrary("libc.so", {{}, {"sync"}, {}, {}});
+    WriteLibrary("libx.so", {{}, {"begin"}, {}, {}});
+    parts = {{"the start entry", {"start", {}}},
+             {"the plugin version", {"sync", {}}},
+             {"a list", {"begin", {}}},
+             {"another", {"alone", {}}}};
+    WritePlugin("a.so", {{}, {"start", "alone"}, {}, {}});
+    EXPECT_THAT(Report(), IsEmpty());
+    EXPECT_THAT(Found(), ElementsAre("/p/a.so:0 error taken-over: the plugin version is looked up "
+                                     "by its exported name \"sync\", which is exported by "
+                                     "/usr/lib/libc.so too, which the boot program has loaded "
+                                     "before: it serves this plugin"));
+    findings.clear();
+    WritePlugin("b.so", {{"libx.so"}, {"start"}, {}, {}});
+    Report();
+    const std::vector<std::string> found = Found();
+    ASSERT_EQ(found.size(), 6U);
+    EXPECT_EQ(found[0], "/p/a.so:0 error taken-over: the start entry is looked up by its exported "
+                        "name \"start\", which is exported by /p/b.so too: whichever is loaded "
+                        "first serves all of them");
+    EXPECT_EQ(found[2], "/p/a.so:0 error taken-over: a list is looked up by its exported name "
+                        "\"begin\", which is exported by /usr/lib/libx.so too: whichever is "
+                        "loaded first serves all of them");
+}
+
+TEST_P(LinkScopeTest, OfManyThatTakeAPartOverThreeAreNamed) {
+    WriteProgram({});
+    parts = {{"the start entry", {"start", {}}}};
+    for (const char* const name : {"a", "b", "c", "d", "e", "f"}) {
+        WritePlugin(name, {{}, {"start"}, {}, {}});
+    }
+    Report();
+    EXPECT_EQ(Found().back(), "/p/f:0 error taken-over: the start entry is looked up by its "
+                              "exported name \"start\", which is exported by /p/a, /p/b, /p/c and "
+                              "others too: whichever is loaded first serves all of them");
+}
+
+TEST_P(LinkScopeTest, OneFileUnderTwoNamesTakesNothingOver) {
+    WriteProgram({});
+    parts = {{"the start entry", {"start", {}}}};
+    WritePlugin("a.so", {{}, {"start"}, {}, {}});
+    WritePlugin("b.so", {{}, {"start"}, {}, {}});
+    for (Plugin& plugin : plugins) {
+        plugin.file = {3, 4};
+    }
+    EXPECT_THAT(Report(), IsEmpty());
+    EXPECT_THAT(Found(), IsEmpty());
+}
+
+TEST_P(LinkScopeTest, TheBootProgramMayBeALink) {
+    Write("/opt/v/bin/vantor", Object({{"$ORIGIN/../lib/libx.so"}, {}, {}, {}}));
+    Write("/opt/v/lib/libx.so", Object({{}, {"x"}, {}, {}}));
+    boost::filesystem::create_directories(folder.Path() + "/usr/sbin");
+    ASSERT_EQ(symlink("/opt/v/bin/vantor", folder.File("usr/sbin/vantor").c_str()), 0);
+    WritePlugin("a.so", {{}, {}, {"x"}, {}});
+    EXPECT_THAT(Report(), IsEmpty());
+    EXPECT_THAT(Found(), IsEmpty());
+}
+
+TEST_P(LinkScopeTest, ADirectoryOfFilesThatOnlyRootCanReadIsNotAtFault) {
+    WriteProgram({});
+    WriteLibrary("libx.so", {{}, {"x"}, {}, {}});
+    chmod(folder.File("usr/lib/libx.so").c_str(), 0);
+    chmod(folder.Path().c_str(), 0755);
+    WritePlugin("a.so", {{"libx.so"}, {}, {"x"}, {}});
+    const uid_t user = geteuid();
+    if (user == 0 && seteuid(65534) != 0) {
+        GTEST_SKIP() << "root can read all, and there is nobody else here";
+    }
+    const std::set<std::string> refused = Report();
+    ASSERT_EQ(seteuid(user), 0);
+    EXPECT_THAT(refused, IsEmpty());
+    EXPECT_THAT(Found(), ElementsAre("/p/a.so:0 note unchecked-objects: its library "
+                                     "/usr/lib/libx.so cannot be read: Permission denied"));
+}
+
+TEST_P(LinkScopeTest, WhatAPluginsOwnLibrariesDefineIsFoundInIt) {
+    WriteProgram({});
+    WriteLibrary("libx.so", {{}, {"x"}, {}, {}});
+    LinkScope scope(image, GetParam());
+    const std::string content = Object({{"libx.so"}, {"own"}, {}, {}});
+    const ElfFile file(content);
+    const std::size_t plugin =
+        scope.Open({{"/p/a.so", 0, 0}, "/p/a.so"}, Linkage(SharedObject(file)));
+    EXPECT_TRUE(scope.LibrariesDefine(plugin, "x"));
+    EXPECT_FALSE(scope.LibrariesDefine(plugin, "own"));
 }
 
 INSTANTIATE_TEST_SUITE_P(AllArchitectures, LinkScopeTest,
