@@ -106,7 +106,7 @@ std::string LibrarySearch::FindAlongChain(const std::string& name,
         return FindIn(first.linkage->runPath, name, *first.path);
     }
     for (const Requirer& one : chain) {
-        const std::string found = FindIn(one.linkage->inheritedPath, name, *one.path);
+        std::string found = FindIn(one.linkage->inheritedPath, name, *one.path);
         if (!found.empty()) {
             return found;
         }

@@ -174,7 +174,7 @@ void LinkScope::BorrowLibraries(std::size_t plugin) {
     one.borrowed.clear();
     one.closure = loader.Close(one.object, [&](const std::string& name) {
         std::string owner;
-        const ObjectPointer object = Borrow(name, plugin, owner);
+        ObjectPointer object = Borrow(name, plugin, owner);
         if (object != nullptr) {
             one.borrowed.push_back({name, owner});
         }
