@@ -10,7 +10,8 @@ import pytest
 sys.dont_write_bytecode = True
 
 # pylint: disable=wrong-import-position
-from harness import stand_in_proc  # noqa: E402
+from harness import sample_boot, stand_in_proc  # noqa: E402
+from harness.analyze import run_analyze  # noqa: E402
 from harness.base_root import BaseRoot, BuildError, compile_program  # noqa: E402
 from harness.isolation import Isolation, IsolationError  # noqa: E402
 from harness.native_plugin import PluginFactory  # noqa: E402
@@ -158,3 +159,17 @@ def pytest_terminal_summary(terminalreporter):
     """Says how the roots were isolated, and what could not be looked for."""
     for notice in _notices:
         terminalreporter.write_line(f"system tests: {notice}")
+
+
+@pytest.fixture
+def analyze(root):
+    """analyze(argument..., **how) runs the program on this machine, where the logs are."""
+    return lambda *arguments, **how: run_analyze(root, *arguments, **how)
+
+
+@pytest.fixture
+def boot(tmp_path):
+    """The arguments that name the log and the drawing of a boot that has taken place."""
+    (tmp_path / "boot.log").write_text(sample_boot.LOG, encoding="utf-8")
+    (tmp_path / "tree.dot").write_text(sample_boot.DOT, encoding="utf-8")
+    return [str(tmp_path / "boot.log"), "--dot", str(tmp_path / "tree.dot")]
