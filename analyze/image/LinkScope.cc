@@ -272,7 +272,7 @@ bool LinkScope::IsRefused(std::size_t plugin, Findings& findings) {
            LacksImport(*one.object, plugin, findings);
 }
 
-void LinkScope::CheckOrder(std::size_t plugin, Findings& findings) {
+void LinkScope::CheckOrder(std::size_t plugin, Findings& findings) const {
     const Plugin& one = plugins[plugin];
     for (const Borrowed& library : one.borrowed) {
         findings.push_back(DependsOnOrder(one.source, "library", library.name, {library.owner}));

@@ -82,7 +82,7 @@ private:
 
     void FindRefused(Findings& findings);
     static void TellUnreadable(const Plugin& plugin, Findings& findings);
-    void CheckOrder(std::size_t plugin, Findings& findings);
+    void CheckOrder(std::size_t plugin, Findings& findings) const;
     void CheckCalls(std::size_t plugin, Findings& findings) const;
     void CheckParts(std::size_t plugin, Findings& findings) const;
 
