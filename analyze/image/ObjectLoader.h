@@ -41,10 +41,12 @@ public:
     using Source = std::function<ObjectPointer(const std::string& name)>;
     Closure Close(const ObjectPointer& root, const Source& instead = {});
 
-    // The program, its linker and what it brings with it: objects that all others find loaded.
+    // What the boot program says of where to look holds for all that it loads.
     void SetProgram(const ObjectPointer& program) {
         search.SetProgram(program->path, program->linkage);
     }
+
+    // These are loaded before all others, which so bring nothing that is known by their names.
     void SetLoaded(const std::vector<ObjectPointer>& objects);
 
     // The files that have been read, but for those that are none.
