@@ -16,6 +16,10 @@ if(CMAKE_SIZEOF_VOID_P EQUAL 4)
     add_compile_definitions(_FILE_OFFSET_BITS=64 _TIME_BITS=64)
 endif()
 
+# Nobody replaces one function of a library by another of the same name: without this, gcc reckons
+# with that wherever it compiles for shared objects, and neither joins functions nor calls directly.
+add_compile_options(-fno-semantic-interposition)
+
 add_compile_options(-fstack-protector-strong)
 add_link_options(-Wl,-z,relro -Wl,-z,now)
 

@@ -70,12 +70,12 @@ void Node::ScheduleLocked(Executor& executor) {
 void Node::Request(Executor& executor) {
     std::vector<Node*> requesters;
     Node* node = this;
-    node->BecomeWaiting();
+    node->BecomeWaiting(executor);
     for (;;) {
         if (Node* const idle = node->NextIdleDependency()) {
             requesters.push_back(node);
             node = idle;
-            node->BecomeWaiting();
+            node->BecomeWaiting(executor);
             continue;
         }
         node->settled = 0;
@@ -88,7 +88,8 @@ void Node::Request(Executor& executor) {
     }
 }
 
-void Node::BecomeWaiting() {
+void Node::BecomeWaiting(Executor& executor) {
+    executor.NodeRequested();
     state = NodeState::Waiting;
     settled = 0;
 }
@@ -119,13 +120,18 @@ void Node::Execute(Executor& executor, GlobalLockGuard& guard) {
     Run();
     guard.Retake();
     state = NodeState::Done;
+    executor.NodeDone();
     for (Node* dependent : dependents) {
         if (dependent->state == NodeState::Waiting) {
             dependent->QueueIfReady(executor);
         }
     }
-    GlobalLock::Broadcast(doneCondition);
+    if (awaited) {
+        GlobalLock::Broadcast(doneCondition);
+    }
 }
+
+bool Node::AllDone(const Executor& executor) { return executor.AllDone(); }
 
 void Node::WaitDone() {
     const GlobalLockGuard guard;
@@ -134,6 +140,7 @@ void Node::WaitDone() {
 
 void Node::WaitDoneLocked() {
     while (state != NodeState::Done) {
+        awaited = true;
         GlobalLock::Wait(doneCondition);
     }
 }
@@ -157,18 +164,19 @@ std::int32_t Node::HeightLocked() {
 
 // Depth first. While a node is under way its height is that of the highest dependent seen so far,
 // and 0 before there is one; a dependent that is under way itself closes a cycle. The way back lies
-// in the nodes: beside them it would be copied again and again while it grows.
+// in the nodes: beside them it would be copied again and again while it grows. No node of unknown
+// height has another one behind it in the ready queue, so that `next` is free, and null.
 void Node::ComputeHeight() {
     height = 0;
     for (Node* node = this; node != nullptr;) {
         if (Node* const unknown = node->NextWithoutHeight()) {
             unknown->height = 0;
-            unknown->heightSeeker = node;
+            unknown->next = node;
             node = unknown;
         } else {
             ++node->height;
             node->heightKnown = true;
-            node = node->heightSeeker;
+            node = node->next;
         }
     }
 }

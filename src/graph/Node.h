@@ -87,7 +87,8 @@ public:
     void WaitDone();
 
     // Requests every node of a sequence of pointers, in its order, and blocks until all are done.
-    // No worker chooses before all are requested. The calling thread must not hold the lock.
+    // No worker chooses before all are requested, and no other executor has been asked for any of
+    // them. The calling thread must not hold the lock.
     template <typename Nodes>
     static void RunAll(const Nodes& nodes, Executor& executor) {
         const GlobalLockGuard guard;
@@ -96,7 +97,8 @@ public:
         }
         // What is requested last is mostly done last: from that end few nodes are found undone, and
         // this thread is seldom woken to take the lock from the workers.
-        for (auto node = std::rbegin(nodes); node != std::rend(nodes); ++node) {
+        for (auto node = std::rbegin(nodes); node != std::rend(nodes) && !AllDone(executor);
+             ++node) {
             (*node)->WaitDoneLocked();
         }
     }
@@ -111,14 +113,16 @@ public:
     std::int32_t Height();
 
 private:
-    friend class ReadyQueue;  // chains the nodes that are ready through `nextReady`
+    friend class ReadyQueue;  // chains the nodes that are ready through `next`
+
+    static bool AllDone(const Executor& executor);
 
     // The caller of any of these holds the lock.
     void ScheduleLocked(Executor& executor);
     void WaitDoneLocked();
     std::int32_t HeightLocked();
     void Request(Executor& executor);
-    void BecomeWaiting();
+    void BecomeWaiting(Executor& executor);
     Node* NextIdleDependency();
     void QueueIfReady(Executor& executor);
     void ComputeHeight();
@@ -127,17 +131,18 @@ private:
     bool heightKnown = false;
     std::int32_t height = -1;
     NodeState state = NodeState::Idle;
+    bool awaited = false;  // whether a thread has waited for `doneCondition`
+    // Of a waiting node: so many of its first dependencies are done. While the node is being
+    // requested: so many have been requested.
+    std::uint32_t settled = 0;
+    // While its height is being found: so many of its dependents have been looked at.
+    std::uint32_t heightsSeen = 0;
+    // While its height is being found: the node whose height that is for. Once it is queued: the
+    // one behind it in its row of the ready queue.
+    Node* next = nullptr;
     std::string name;
     Edges dependencies;
     Edges dependents;
-    // Of a waiting node: so many of its first dependencies are done. While the node is being
-    // requested: so many have been requested.
-    std::size_t settled = 0;
-    // While its height is being found: the node whose height that is for, and how many of its
-    // dependents have been looked at.
-    Node* heightSeeker = nullptr;
-    std::size_t heightsSeen = 0;
-    Node* nextReady = nullptr;
     pthread_cond_t doneCondition;  // broadcast when the node becomes done through Execute()
 };
 

@@ -6,12 +6,20 @@
 
 namespace vantor {
 
+// A node that is alone is the one to take, however high it is. In a chain of plugins, where nothing
+// is ever to be chosen, no height is ever computed.
 void ReadyQueue::Push(Node& node) {
-    const std::int32_t height = node.HeightLocked();
-    if (height > highestHeight && !Empty()) {
-        MakeRow(lower.cbegin(), highestHeight) = std::exchange(highest, Row());
+    if (Empty()) {
+        highestHeight = 0;
+        Append(highest, node);
+        return;
     }
-    if (height > highestHeight || Empty()) {
+    if (highestHeight == 0) {
+        highestHeight = highest.first->HeightLocked();
+    }
+    const std::int32_t height = node.HeightLocked();
+    if (height > highestHeight) {
+        MakeRow(lower.cbegin(), highestHeight) = std::exchange(highest, Row());
         highestHeight = height;
     }
     Append(height == highestHeight ? highest : LowerRow(height), node);
@@ -22,9 +30,9 @@ Node& ReadyQueue::TakeHighest(std::size_t position) {
     Node* taken = highest.first;
     for (; position > 0; --position) {
         before = taken;
-        taken = taken->nextReady;
+        taken = taken->next;
     }
-    (before == nullptr ? highest.first : before->nextReady) = taken->nextReady;
+    (before == nullptr ? highest.first : before->next) = taken->next;
     if (taken == highest.last) {
         highest.last = before;
     }
@@ -52,8 +60,8 @@ ReadyQueue::Row& ReadyQueue::MakeRow(Rows::const_iterator before, std::int32_t h
 }
 
 void ReadyQueue::Append(Row& row, Node& node) {
-    node.nextReady = nullptr;
-    (row.count == 0 ? row.first : row.last->nextReady) = &node;
+    node.next = nullptr;
+    (row.count == 0 ? row.first : row.last->next) = &node;
     row.last = &node;
     ++row.count;
 }

@@ -266,6 +266,57 @@ TEST_F(ExecutorTest, EveryWorkerIsWokenForEachQueuedNode) {
     EXPECT_EQ(Faults().condBroadcast.Calls(), 3);
 }
 
+TEST_F(ExecutorTest, IdleWorkerGivesWayBeforeItSleeps) {
+    std::atomic<int> yieldsBeforeSleep{-1};
+    Faults().condWait.Before([&] { yieldsBeforeSleep = Faults().yield.Calls(); });
+    const Executor executor(1, false);
+    EXPECT_TRUE(WaitUntil([&] { return yieldsBeforeSleep >= 0; }));
+    EXPECT_GT(yieldsBeforeSleep, 0);
+}
+
+TEST_F(ExecutorTest, WorkerThatGivesWayDoesNotHoldTheLock) {
+    std::atomic<bool> held{false};
+    Faults().yield.Before([&] { held = held || GlobalLock::HeldByCurrentThread(); });
+    const Executor executor(1, false);
+    EXPECT_TRUE(WaitUntil([] { return Faults().condWait.Calls() > 0; }));
+    EXPECT_GT(Faults().yield.Calls(), 0);
+    EXPECT_FALSE(held);
+}
+
+// The plugin is requested while nobody sleeps: no broadcast would wake the worker for it later.
+TEST_F(ExecutorTest, WorkerThatGivesWayTakesWhatIsQueuedMeanwhileWithoutSleeping) {
+    GraphText graph({"a"});
+    std::atomic<bool> givingWay{false};
+    std::atomic<bool> requested{false};
+    Faults().yield.Before([&] {
+        givingWay = true;
+        EXPECT_TRUE(WaitUntil([&] { return requested.load(); }));
+    });
+    std::atomic<bool> sleptBefore{false};
+    graph["a"].onRun = [&] { sleptBefore = Faults().condWait.Calls() > 0; };
+    Executor executor(1, false);
+    EXPECT_TRUE(WaitUntil([&] { return givingWay.load(); }));
+    graph.Schedule(executor);
+    requested = true;
+    EXPECT_TRUE(WaitUntil([&] { return graph["a"].State() == NodeState::Done; }));
+    EXPECT_FALSE(sleptBefore);
+}
+
+TEST_F(ExecutorTest, WorkerThatGivesWayWhileThePoolStopsLeavesWithoutSleeping) {
+    std::atomic<bool> givingWay{false};
+    std::atomic<bool> joining{false};
+    Faults().yield.Before([&] {
+        givingWay = true;
+        EXPECT_TRUE(WaitUntil([&] { return joining.load(); }));
+    });
+    Faults().threadJoin.Before([&] { joining = true; });
+    {
+        const Executor executor(1, false);
+        EXPECT_TRUE(WaitUntil([&] { return givingWay.load(); }));
+    }
+    EXPECT_EQ(Faults().condWait.Calls(), 0);
+}
+
 TEST_F(ExecutorTest, SecondExecutorRunsWhatTheFirstLeft) {
     GraphText graph({"a", "b requires x", "c provides x"});
     {

@@ -5,8 +5,8 @@
 namespace vantor::support {
 
 void GraphFaults::Reset() {
-    for (FaultPoint* fault :
-         {&condInit, &threadCreate, &threadJoin, &condWait, &condBroadcast, &rand, &srand}) {
+    for (FaultPoint* fault : {&condInit, &threadCreate, &threadJoin, &condWait, &condBroadcast,
+                              &yield, &rand, &srand}) {
         fault->Reset();
     }
     draws.clear();
@@ -34,6 +34,7 @@ int __real_pthread_join(pthread_t thread, void** result);
 int __real_pthread_cond_wait(pthread_cond_t* condition, pthread_mutex_t* mutex);
 int __real_pthread_cond_broadcast(pthread_cond_t* condition);
 pthread_t __real_pthread_self();
+int __real_sched_yield();
 int __real_rand();
 void __real_srand(unsigned seed);
 
@@ -75,6 +76,11 @@ int __wrap_pthread_cond_broadcast(pthread_cond_t* condition) {
 pthread_t __wrap_pthread_self() {
     const pthread_t pretended = Faults().self;
     return pretended != 0 ? pretended : __real_pthread_self();
+}
+
+int __wrap_sched_yield() {
+    (void)Faults().yield.Fails();
+    return __real_sched_yield();
 }
 
 // Called with GlobalLock held, as the executor promises.

@@ -20,6 +20,7 @@ struct GraphFaults {
     FaultPoint threadJoin;
     FaultPoint condWait;
     FaultPoint condBroadcast;
+    FaultPoint yield;
     FaultPoint rand;
     FaultPoint srand;
 

@@ -152,6 +152,23 @@ TEST_F(ReadyQueueTest, WhoComesAfterTheLastWasTakenStandsAtTheEnd) {
     EXPECT_EQ(&queue.TakeHighest(0), &later);
 }
 
+// Its height is computed when it is asked for, and kept from then on.
+TEST_F(ReadyQueueTest, HeightOfANodeThatIsAloneIsNotAskedFor) {
+    TestNode& alone = nodes.OfHeight(1);
+    queue.Push(alone);
+    alone.AddDependent(nodes.OfHeight(3));
+    EXPECT_EQ(alone.Height(), 4);
+}
+
+TEST_F(ReadyQueueTest, NodeThatWasAloneIsComparedWithTheNext) {
+    TestNode& low = nodes.OfHeight(2);
+    TestNode& high = nodes.OfHeight(3);
+    Push({&low, &high});
+    EXPECT_EQ(queue.HighestCount(), 1U);
+    EXPECT_EQ(&queue.TakeHighest(0), &high);
+    EXPECT_EQ(&queue.TakeHighest(0), &low);
+}
+
 // The choice of a plain scan, and of a draw among the highest, at every one of a million steps.
 TEST_F(ReadyQueueTest, AMillionRandomStepsChooseAsAPlainScanDoes) {
     const int greatestHeight = 5;

@@ -15,7 +15,7 @@ bool WaitUntil(Condition condition) {
         if (std::chrono::steady_clock::now() > end) {
             return false;
         }
-        std::this_thread::yield();
+        std::this_thread::sleep_for(std::chrono::microseconds(50));
     }
     return true;
 }
