@@ -18,17 +18,17 @@
 
 namespace {
 
-// Opened twice: the first time without an effect on whatever lies there.
+// Nothing is opened before it is known to be a file: opening a device can have an effect.
 bool IsWhole(const std::string& path) {
-    char headers[1024];
     struct stat status {};
-    const int location = open(path.c_str(), O_PATH | O_CLOEXEC);
-    const bool isFile = fstat(location, &status) == 0 && S_ISREG(status.st_mode);
+    if (stat(path.c_str(), &status) != 0 || !S_ISREG(status.st_mode)) {
+        return false;
+    }
+    char headers[1024];
     const int file = open(path.c_str(), O_RDONLY | O_CLOEXEC);
     const bool isRead = pread(file, headers, sizeof headers, 0) > 0;
     close(file);
-    close(location);
-    return isFile && isRead;
+    return isRead;
 }
 
 void LookForDebugConfiguration() {

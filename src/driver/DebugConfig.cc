@@ -1,13 +1,18 @@
 #include "driver/DebugConfig.h"
 
+#include <fcntl.h>
 #include <syslog.h>
+#include <unistd.h>
 
+#include <array>
 #include <boost/tokenizer.hpp>
 #include <cstddef>
-#include <fstream>
+#include <sstream>
 #include <stdexcept>
 #include <utility>
 #include <vector>
+
+#include "io/FileDescriptor.h"
 
 namespace vantor {
 
@@ -19,6 +24,23 @@ constexpr char escapeCharacter = '\\';
 constexpr char listSeparator = ',';
 constexpr const char* quoteCharacters = "\"'";
 constexpr const char* special = "\\\"'";  // the escape character and the quote characters
+
+// Empty when the file cannot be read.
+std::string ContentOf(const char* path) {
+    std::string content;
+    const FileDescriptor file(open(path, O_RDONLY | O_CLOEXEC));
+    if (!file.IsOpen()) {
+        return content;
+    }
+    std::array<char, 4096> piece;
+    for (;;) {
+        const ssize_t count = TEMP_FAILURE_RETRY(read(file.Get(), piece.data(), piece.size()));
+        if (count <= 0) {
+            return content;
+        }
+        content.append(piece.data(), static_cast<std::size_t>(count));
+    }
+}
 
 std::string Trim(const std::string& text) {
     const std::size_t first = text.find_first_not_of(whiteSpace);
@@ -103,9 +125,15 @@ bool ParseEntry(const std::string& line, int lineNumber, std::list<DebugEntry>& 
 
 }  // namespace
 
+// Asked once for each plugin file, and mostly there is nothing: a stream, which takes longer to
+// make than all the rest, is made only for what there is to read.
 std::list<DebugEntry> ReadDebugConfig() {
-    std::ifstream file(debugConfigFile);
-    return ParseDebugConfig(file);
+    const std::string content = ContentOf(debugConfigFile);
+    if (content.empty()) {
+        return {};
+    }
+    std::istringstream stream(content);
+    return ParseDebugConfig(stream);
 }
 
 std::list<DebugEntry> ParseDebugConfig(std::istream& stream) {

@@ -91,16 +91,9 @@ bool IsCutShort(const Headers& headers, std::uint64_t fileSize) {
 }  // namespace
 
 std::string ReasonNotToLoad(const std::string& path) {
-    // O_PATH names the file without opening it: opening a device can already have an effect.
-    const FileDescriptor location(open(path.c_str(), O_PATH | O_CLOEXEC));
+    // Asked before anything is opened: opening a device can already have an effect.
     struct stat status {};
-    if (!location.IsOpen()) {
-        return {};
-    }
-    if (fstat(location.Get(), &status) != 0) {
-        return "its file status cannot be read";
-    }
-    if (S_ISDIR(status.st_mode)) {
+    if (stat(path.c_str(), &status) != 0 || S_ISDIR(status.st_mode)) {
         return {};
     }
     if (!S_ISREG(status.st_mode)) {

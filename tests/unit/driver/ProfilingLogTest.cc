@@ -7,6 +7,7 @@
 
 #include <boost/filesystem/operations.hpp>
 #include <ctime>
+#include <iomanip>
 #include <iterator>
 #include <sstream>
 
@@ -58,6 +59,21 @@ TEST(FormatTimeTest, YearsBefore1000AndFewMicrosecondsArePaddedWithZeros) {
     time.tv_sec = static_cast<time_t>(-30641760000LL);
     time.tv_usec = 1;
     EXPECT_EQ(Formatted(time), "0999-01-01 00:00:00.000001");
+}
+
+TEST(FormatTimeTest, YearsThatNeedMoreRoomTakeIt) {
+    timeval time{};
+    time.tv_sec = static_cast<time_t>(253402300800LL);
+    EXPECT_EQ(Formatted(time), "10000-01-01 00:00:00.000000");
+    time.tv_sec = static_cast<time_t>(-62324985600LL);
+    EXPECT_EQ(Formatted(time), "00-5-01-01 00:00:00.000000");
+}
+
+TEST(FormatTimeTest, WidthThatTheStreamWasToldBeforeIsOver) {
+    std::ostringstream stream;
+    stream << std::setw(40);
+    FormatTime(stream, {0, 0}) << 7;
+    EXPECT_EQ(stream.str(), "1970-01-01 00:00:00.0000007");
 }
 
 TEST(FormatTimeTest, ReturnsTheStreamWithZeroAsItsFillCharacter) {
