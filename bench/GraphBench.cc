@@ -1,7 +1,8 @@
 // What a graph of nodes that do nothing costs to run:
 //
-//     bench-graph run vantor|flow SHAPE NODES WORKERS    vantor's executor, or oneTBB's flow graph
-//     bench-graph check vantor|flow SHAPE NODES WORKERS  the same, but nodes count themselves
+//     bench-graph boot vantor|flow SHAPE NODES WORKERS   vantor's executor, or oneTBB's flow graph
+//     bench-graph again vantor|flow SHAPE NODES WORKERS  the same again and again; the median
+//     bench-graph check vantor|flow SHAPE NODES WORKERS  once, and nodes count themselves
 //     bench-graph schedule near|far NODES                requesting a chain from one of its ends
 //     bench-graph height NODES                           of the first node of a chain
 //     bench-graph memory KIND NODES                      resident bytes; see MemoryBench.cc
@@ -71,32 +72,29 @@ double Nanoseconds(const Work& work) {
 
 // As the driver does it: the executor is there first, then every node is requested in order.
 template <typename Kind>
-double RunVantor(const GraphShape& shape, int workers) {
+double RunVantor(const GraphShape& shape, Executor& executor) {
     auto& nodes = *new std::deque<Kind>(Build<Kind>(shape));
     std::vector<Node*> sequence;
     sequence.reserve(nodes.size());
     for (Node& node : nodes) {
         sequence.push_back(&node);
     }
-    Executor executor(workers, false);
     return Nanoseconds([&] { Node::RunAll(sequence, executor); });
 }
 
-double RunOnce(const std::string& program, const GraphShape& shape, int workers) {
-    return program == "flow" ? RunFlowGraph(shape, workers, false)
-                             : RunVantor<EmptyNode>(shape, workers);
-}
-
-// A run of a small graph is over before caches are warm and workers have been woken once: such a
-// graph is built and run several times, and the median counts.
-void MeasureRun(const std::vector<std::string>& words) {
+// Once, as in a boot; or so often that caches are warm, each time with a graph of its own and all
+// with the same threads.
+void MeasureRuns(const std::vector<std::string>& words) {
     constexpr std::size_t enough = 100000;
     const GraphShape shape = MakeShape(words.at(2), std::stoul(words.at(3)));
     const int workers = std::stoi(words.at(4));
-    const bool once = RUNNING_ON_VALGRIND != 0;
-    std::vector<double> taken(once ? 1 : std::max<std::size_t>(1, enough / shape.count));
+    const std::size_t runCount = words.at(0) == "boot" ? 1 : 1 + enough / shape.count;
+    std::vector<double> taken(runCount);
+    const bool isVantor = words.at(1) == "vantor";
+    Executor executor(isVantor ? workers : 0, false);
     for (double& one : taken) {
-        one = RunOnce(words.at(1), shape, workers);
+        one = isVantor ? RunVantor<EmptyNode>(shape, executor)
+                       : RunFlowGraph(shape, workers, false);
     }
     std::sort(taken.begin(), taken.end());
     Report(taken[taken.size() / 2]);
@@ -108,7 +106,8 @@ void CheckRun(const std::vector<std::string>& words) {
     if (words.at(1) == "flow") {
         Report(RunFlowGraph(shape, workers, true));
     }
-    const double taken = RunVantor<CountingNode>(shape, workers);
+    Executor executor(workers, false);
+    const double taken = RunVantor<CountingNode>(shape, executor);
     if (runs != shape.count) {
         throw std::runtime_error("the executor did not run every node once");
     }
@@ -146,8 +145,8 @@ void MeasureHeight(std::size_t count) {
 
 void Measure(const std::vector<std::string>& words) {
     const std::string& mode = words.at(0);
-    if (mode == "run") {
-        MeasureRun(words);
+    if (mode == "boot" || mode == "again") {
+        MeasureRuns(words);
     } else if (mode == "check") {
         CheckRun(words);
     } else if (mode == "schedule") {

@@ -78,6 +78,15 @@ def test_a_ratio_is_the_median_over_the_rounds():
     assert row.verdict == "missed"
 
 
+def test_what_is_to_stay_the_same_has_grown_only_when_chance_is_not_enough():
+    steady = Row("group", "work", "ours", 3, "us", "ours", 2, [0.9, 1.0, 1.1, 1.2], limit=1.0,
+                 growth=True)
+    assert steady.ratio > 1 and steady.verdict == "kept"
+    grown = Row("group", "work", "ours", 3, "us", "ours", 2, [1.0, 1.1, 1.1, 1.2], limit=1.0,
+                growth=True)
+    assert grown.verdict == "missed"
+
+
 def test_candidates_take_turns_in_turning_order():
     order = []
     results = Results(rounds=2, quick=True)

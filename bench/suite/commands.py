@@ -89,10 +89,20 @@ def _side_by_side(host, results, shape, counts):
         results.compare(GROUP, f"{count:,} {shape} commands, processor time", "us/command",
                         ("vantor --parallel", processor["vantor", count]),
                         ("8 bare threads", processor["bare", count]))
-    results.compare(GROUP, f"{shape}, from {counts[0]:,} to {counts[-1]:,} commands", "us/command",
-                    (f"vantor, {counts[-1]:,}", figures["vantor", counts[-1]]),
-                    (f"vantor, {counts[0]:,}", figures["vantor", counts[0]]), 1.0)
+    _growth(results, f"{shape}, from {counts[0]:,} to {counts[-1]:,} commands", counts, figures)
     return figures
+
+
+def _growth(results, work, counts, figures):
+    """By the clock, and in times of the bare threads, which take longer for more commands too."""
+    bare = {count: [ours / theirs for ours, theirs in zip(figures["vantor", count],
+                                                          figures["bare", count])]
+            for count in counts}
+    clock = {count: figures["vantor", count] for count in counts}
+    for what, unit, taken in (("", "us/command", clock),
+                              (", beside the bare threads", "times theirs", bare)):
+        results.compare(GROUP, work + what, unit, (f"vantor, {counts[-1]:,}", taken[counts[-1]]),
+                        (f"vantor, {counts[0]:,}", taken[counts[0]]), 1.0, growth=True)
 
 
 def _by_clock(figures):

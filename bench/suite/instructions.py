@@ -41,7 +41,7 @@ def _count_whole(host, *command):
 def _graph(host, results, count):
     for shape in ("independent", "layered", "chain"):
         results.progress.say(f"{GROUP}: {shape} graph")
-        ours, theirs = ([_count_part(host, "bench-graph", "run", program, shape, count, 1) / count]
+        ours, theirs = ([_count_part(host, "bench-graph", "boot", program, shape, count, 1) / count]
                         for program in ("vantor", "flow"))
         results.compare(GROUP, f"{count:,} empty nodes, {shape}, 1 worker", "per node",
                         ("vantor", ours), ("oneTBB", theirs))

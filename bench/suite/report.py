@@ -35,9 +35,9 @@ def _row(row):
         return f"| {row.work} | {row.subject} {ours} | | | | |"
     low, high = row.quartiles
     spread = f"{low:.2f} to {high:.2f}" if len(row.ratios) > 1 else ""
-    limit = f"{row.limit:g} {row.verdict}" if row.limit is not None else ""
+    limit = "" if row.limit is None else "no growth" if row.growth else f"{row.limit:g}"
     cells = [row.work, f"{row.subject} {ours}", f"{row.reference} {figure(row.reference_value)}",
-             f"{row.ratio:.2f}", spread, limit]
+             f"{row.ratio:.2f}", spread, f"{limit} {row.verdict}".strip()]
     return "| " + " | ".join(cells).rstrip() + " |"
 
 

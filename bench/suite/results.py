@@ -16,6 +16,8 @@ class Row:
 
     ratios  ours divided by the other, one for each round
     limit   what the ratio is to stay at or below; None where nothing is asked
+    growth  both figures are ours, at two sizes, and are to be the same: equal ones differ by chance,
+            so that only a ratio beyond the limit in three quarters of the rounds is a growth
     """
 
     group: str
@@ -27,6 +29,7 @@ class Row:
     reference_value: float = 0.0
     ratios: list = field(default_factory=list)
     limit: float = None
+    growth: bool = False
 
     @property
     def ratio(self):
@@ -43,7 +46,8 @@ class Row:
     def verdict(self):
         if self.limit is None or not self.ratios:
             return ""
-        return "kept" if self.ratio <= self.limit else "missed"
+        counts = self.quartiles[0] if self.growth else self.ratio
+        return "kept" if counts <= self.limit else "missed"
 
 
 @dataclass
@@ -102,8 +106,8 @@ class Results:
         """Reports a figure that is compared with nothing."""
         self.rows.append(Row(group, work, subject, statistics.median(values), unit))
 
-    def compare(self, group, work, unit, ours, theirs, limit=None):
+    def compare(self, group, work, unit, ours, theirs, limit=None, growth=False):
         """Reports a pair. `ours` and `theirs` are (name, figures of the same rounds)."""
         ratios = [one / other for one, other in zip(ours[1], theirs[1])]
         self.rows.append(Row(group, work, ours[0], statistics.median(ours[1]), unit, theirs[0],
-                             statistics.median(theirs[1]), ratios, limit))
+                             statistics.median(theirs[1]), ratios, limit, growth))
