@@ -25,7 +25,7 @@ constexpr char listSeparator = ',';
 constexpr const char* quoteCharacters = "\"'";
 constexpr const char* special = "\\\"'";  // the escape character and the quote characters
 
-// Empty when the file cannot be read.
+// Empty when the file cannot be read to its end: a command that is cut off is not to be run.
 std::string ContentOf(const char* path) {
     std::string content;
     const FileDescriptor file(open(path, O_RDONLY | O_CLOEXEC));
@@ -36,7 +36,7 @@ std::string ContentOf(const char* path) {
     for (;;) {
         const ssize_t count = TEMP_FAILURE_RETRY(read(file.Get(), piece.data(), piece.size()));
         if (count <= 0) {
-            return content;
+            return count == 0 ? content : std::string();
         }
         content.append(piece.data(), static_cast<std::size_t>(count));
     }

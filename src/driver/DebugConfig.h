@@ -19,7 +19,7 @@ struct DebugEntry {
 };
 
 // Reads "/etc/nuvex/vantor/debug.conf" and returns its entries in file order. A file that cannot be
-// opened has none. Malformed lines are reported to syslog (LOG_INFO) and skipped.
+// read has none. Malformed lines are reported to syslog (LOG_INFO) and skipped.
 std::list<DebugEntry> ReadDebugConfig();
 
 // The same from an open stream.

@@ -20,6 +20,18 @@ struct WorkerStart {
     std::int32_t index;
 };
 
+// Every node that is queued wakes all idle workers, and mostly all but one in vain. Back to sleep
+// at once, they would be there to be woken for the very next node, at many times the cost of a
+// short one. So they first let others have the processor, and look again.
+void GiveWay(GlobalLockGuard& guard) {
+    constexpr int turns = 3;
+    guard.Release();
+    for (int i = 0; i < turns; ++i) {
+        sched_yield();
+    }
+    guard.Retake();
+}
+
 }  // namespace
 
 Executor::Executor(std::int32_t threadCount, bool randomizeEquals) : randomize(randomizeEquals) {
@@ -104,18 +116,6 @@ void Executor::RunWorker() {
             GlobalLock::Wait(workAvailable);
         }
     }
-}
-
-// Every node that is queued wakes all idle workers, and mostly all but one in vain. Back to sleep
-// at once, they would be there to be woken for the very next node, at many times the cost of a
-// short one. So they first let others have the processor, and look again.
-void Executor::GiveWay(GlobalLockGuard& guard) {
-    constexpr int turns = 3;
-    guard.Release();
-    for (int i = 0; i < turns; ++i) {
-        sched_yield();
-    }
-    guard.Retake();
 }
 
 }  // namespace vantor

@@ -11,7 +11,6 @@
 
 namespace vantor {
 
-class GlobalLockGuard;
 class Node;
 
 // Runs the dependency graph on a fixed pool of threads. Of the ready nodes the one with the longest
@@ -19,7 +18,7 @@ class Node;
 // equals the one that has been ready longest, or a random one. One worker gives serial order.
 //
 // A run: construct the executor, Node::RunAll() the plugins in load order, destroy the executor.
-// Everything but `threads` is guarded by GlobalLock; `threads` belongs to the thread that
+// The ready queue and the stop flag are guarded by GlobalLock; `threads` belongs to the thread that
 // constructs and destroys the executor.
 class Executor {
 public:
@@ -39,12 +38,6 @@ public:
     // holds GlobalLock and has set the node's state; the node must outlive the executor.
     void Enqueue(Node& node);
 
-    // Count the nodes that have been requested and are not done. Only for Node, which holds
-    // GlobalLock.
-    void NodeRequested() { ++unfinished; }
-    void NodeDone() { --unfinished; }
-    bool AllDone() const { return unfinished == 0; }
-
     // Which node to run next: its position among the highest of the queue, counted from 0 in the
     // order in which they became ready. The caller holds GlobalLock, and the queue is not empty.
     std::size_t PickNext() const;
@@ -58,13 +51,11 @@ public:
 private:
     static void* WorkerEntry(void* argument);
     void RunWorker();
-    static void GiveWay(GlobalLockGuard& guard);
     void StartWorkers(std::int32_t threadCount);
     void StopWorkers();
 
     pthread_cond_t workAvailable;  // broadcast when a node is queued and when the pool stops
     ReadyQueue queue;
-    std::size_t unfinished = 0;
     std::vector<pthread_t> threads;
     bool stopping = false;
     bool randomize;

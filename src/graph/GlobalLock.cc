@@ -15,10 +15,10 @@ void Pause(int length) {
     }
 }
 
-// What is done under the lock takes far less than a microsecond. Who finds it taken therefore tries
-// again for about as long as going to sleep and being woken would take, and mostly spares itself
-// that and the holder the system call that wakes. The pauses double, so that the trying hardly
-// disturbs the holder.
+// What is done under the lock mostly takes far less than a microsecond. Who finds it taken
+// therefore tries again for about as long as going to sleep and being woken may take, and so spares
+// itself that, and the holder the system call that wakes. The pauses double: the trying is to
+// disturb the holder little.
 void Acquire(pthread_mutex_t& mutex) {
     constexpr int tries = 10;
     constexpr int longestPause = 128;

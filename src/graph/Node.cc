@@ -18,6 +18,8 @@ void Remove(Node::Edges& edges, const Node* node) {
 
 }  // namespace
 
+std::size_t Node::unfinished = 0;
+
 Node::Node(std::string nodeName) : name(std::move(nodeName)) {
     if (pthread_cond_init(&doneCondition, nullptr) != 0) {
         throw Exception("Condition variable for Node could not be initialized");
@@ -70,12 +72,12 @@ void Node::ScheduleLocked(Executor& executor) {
 void Node::Request(Executor& executor) {
     std::vector<Node*> requesters;
     Node* node = this;
-    node->BecomeWaiting(executor);
+    node->BecomeWaiting();
     for (;;) {
         if (Node* const idle = node->NextIdleDependency()) {
             requesters.push_back(node);
             node = idle;
-            node->BecomeWaiting(executor);
+            node->BecomeWaiting();
             continue;
         }
         node->settled = 0;
@@ -88,8 +90,8 @@ void Node::Request(Executor& executor) {
     }
 }
 
-void Node::BecomeWaiting(Executor& executor) {
-    executor.NodeRequested();
+void Node::BecomeWaiting() {
+    ++unfinished;
     state = NodeState::Waiting;
     settled = 0;
 }
@@ -119,8 +121,10 @@ void Node::Execute(Executor& executor, GlobalLockGuard& guard) {
     guard.Release();
     Run();
     guard.Retake();
+    if (state == NodeState::Queued) {
+        --unfinished;
+    }
     state = NodeState::Done;
-    executor.NodeDone();
     for (Node* dependent : dependents) {
         if (dependent->state == NodeState::Waiting) {
             dependent->QueueIfReady(executor);
@@ -130,8 +134,6 @@ void Node::Execute(Executor& executor, GlobalLockGuard& guard) {
         GlobalLock::Broadcast(doneCondition);
     }
 }
-
-bool Node::AllDone(const Executor& executor) { return executor.AllDone(); }
 
 void Node::WaitDone() {
     const GlobalLockGuard guard;

@@ -87,8 +87,7 @@ public:
     void WaitDone();
 
     // Requests every node of a sequence of pointers, in its order, and blocks until all are done.
-    // No worker chooses before all are requested, and no other executor has been asked for any of
-    // them. The calling thread must not hold the lock.
+    // No worker chooses before all are requested. The calling thread must not hold the lock.
     template <typename Nodes>
     static void RunAll(const Nodes& nodes, Executor& executor) {
         const GlobalLockGuard guard;
@@ -97,8 +96,7 @@ public:
         }
         // What is requested last is mostly done last: from that end few nodes are found undone, and
         // this thread is seldom woken to take the lock from the workers.
-        for (auto node = std::rbegin(nodes); node != std::rend(nodes) && !AllDone(executor);
-             ++node) {
+        for (auto node = std::rbegin(nodes); node != std::rend(nodes) && unfinished != 0; ++node) {
             (*node)->WaitDoneLocked();
         }
     }
@@ -115,18 +113,20 @@ public:
 private:
     friend class ReadyQueue;  // chains the nodes that are ready through `next`
 
-    static bool AllDone(const Executor& executor);
-
     // The caller of any of these holds the lock.
     void ScheduleLocked(Executor& executor);
     void WaitDoneLocked();
     std::int32_t HeightLocked();
     void Request(Executor& executor);
-    void BecomeWaiting(Executor& executor);
+    void BecomeWaiting();
     Node* NextIdleDependency();
     void QueueIfReady(Executor& executor);
     void ComputeHeight();
     Node* NextWithoutHeight();
+
+    // So many nodes have been requested and are not done; too many where one that was requested is
+    // declared done or destroyed, but never too few. Of all executors together.
+    static std::size_t unfinished;
 
     bool heightKnown = false;
     std::int32_t height = -1;

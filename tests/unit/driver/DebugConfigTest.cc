@@ -3,11 +3,33 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 #include <syslog.h>
+#include <unistd.h>
 
+#include <cerrno>
 #include <sstream>
 
+#include "support/FaultPoint.h"
 #include "support/PrivateRoot.h"
 #include "support/SyslogCapture.h"
+
+namespace {
+
+// The reading of files by this test's process.
+vantor::support::FaultPoint& ReadFault() {
+    static vantor::support::FaultPoint fault;
+    return fault;
+}
+
+}  // namespace
+
+extern "C" {
+
+ssize_t __real_read(int descriptor, void* buffer, std::size_t size);
+ssize_t __wrap_read(int descriptor, void* buffer, std::size_t size) {
+    return ReadFault().Fails() ? -1 : __real_read(descriptor, buffer, size);
+}
+
+}  // extern "C"
 
 namespace vantor {
 
@@ -182,6 +204,39 @@ TEST_F(DebugConfigTest, TheFileIsReadFromItsFixedPlace) {
     const support::PrivateRoot root;
     root.Write("/etc/nuvex/vantor/debug.conf", "x:a:b:c\n");
     EXPECT_THAT(ReadDebugConfig(), ElementsAre(Entry("x", {"a"}, {"b"}, "c")));
+}
+
+TEST_F(DebugConfigTest, AFileOfManyPiecesIsReadWhole) {
+    const support::PrivateRoot root;
+    std::string lines;
+    for (int line = 0; line < 1000; ++line) {
+        lines += "x" + std::to_string(line) + ":a:b:c\n";
+    }
+    root.Write("/etc/nuvex/vantor/debug.conf", lines + "last:a:b:c");
+    const std::list<DebugEntry> entries = ReadDebugConfig();
+    ASSERT_THAT(entries, SizeIs(1001));
+    EXPECT_EQ(entries.back().name, "last");
+    EXPECT_EQ(entries.back().line, 1001);
+}
+
+// A signal handler that does not restart system calls.
+TEST_F(DebugConfigTest, AnInterruptedReadGoesOn) {
+    const support::PrivateRoot root;
+    root.Write("/etc/nuvex/vantor/debug.conf", "x:a:b:c\n");
+    ReadFault().FailCall(1, EINTR);
+    EXPECT_THAT(ReadDebugConfig(), SizeIs(1));
+    ReadFault().Reset();
+}
+
+// The command of the line at which reading stops would be cut off.
+TEST_F(DebugConfigTest, AFileThatCannotBeReadToItsEndIsEmptyAndSilent) {
+    const support::PrivateRoot root;
+    root.Write("/etc/nuvex/vantor/debug.conf", "x:a:b:c\ny:a:b:" + std::string(5000, 'c'));
+    ReadFault().FailCall(2, EIO);
+    EXPECT_THAT(ReadDebugConfig(), IsEmpty());
+    EXPECT_EQ(ReadFault().Calls(), 2);
+    ReadFault().Reset();
+    EXPECT_THAT(log.Entries(), IsEmpty());
 }
 
 TEST_F(DebugConfigTest, AMissingFileIsEmptyAndSilent) {

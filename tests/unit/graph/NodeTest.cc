@@ -2,7 +2,9 @@
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
+#include <unistd.h>
 
+#include <atomic>
 #include <cerrno>
 #include <memory>
 #include <thread>
@@ -14,16 +16,19 @@
 #include "plugins/Exceptions.h"
 #include "support/ErrorText.h"
 #include "support/GraphText.h"
+#include "support/Waiting.h"
 
 namespace vantor {
 
 namespace {
 
+using support::Execute;
 using support::ExpectEdgesAgree;
 using support::Faults;
 using support::GraphText;
 using support::RunOrder;
 using support::TestNode;
+using support::WaitUntil;
 using ::testing::ElementsAre;
 using ::testing::IsEmpty;
 
@@ -200,6 +205,45 @@ TEST_F(NodeTest, RunAllRequestsEveryNodeBeforeAWorkerChooses) {
     Executor executor(1, false);
     Node::RunAll(std::vector<Node*>{&graph["low"], &graph["high"], &graph["last"]}, executor);
     EXPECT_THAT(graph.Order(), ElementsAre("high", "low", "last"));
+}
+
+TEST_F(NodeTest, RunAllWaitsForEachOfManyThatTakeDifferentTimes) {
+    GraphText graph({"a", "b", "c", "d", "e", "f"});
+    std::vector<Node*> nodes;
+    for (const char* const name : {"a", "b", "c", "d", "e", "f"}) {
+        graph[name].onRun = [name] { usleep(name[0] % 2 == 0 ? 1000 : 3000); };
+        nodes.push_back(&graph[name]);
+    }
+    Executor executor(3, false);
+    Node::RunAll(nodes, executor);
+    for (const Node* node : nodes) {
+        EXPECT_EQ(node->State(), NodeState::Done) << node->Name();
+    }
+}
+
+// What one executor was asked for is run by the other, which was asked for what it waits for.
+TEST_F(NodeTest, RunAllWaitsForItsOwnNodesThoughItsExecutorRunsOnesThatAnotherWasAskedFor) {
+    GraphText graph({"shared provides x", "foreign requires x", "slow", "last"});
+    Executor other(0, false);
+    Executor executor(2, false);
+    std::atomic<bool> mayEnd{false};
+    graph["shared"].onRun = [&] { EXPECT_TRUE(WaitUntil([&] { return mayEnd.load(); })); };
+    graph["slow"].onRun = [] { usleep(20000); };
+    graph["shared"].Schedule(executor);
+    graph["foreign"].Schedule(other);
+    mayEnd = true;
+    Node::RunAll(std::vector<Node*>{&graph["slow"], &graph["last"]}, executor);
+    EXPECT_EQ(graph["slow"].State(), NodeState::Done);
+    graph["foreign"].WaitDone();
+}
+
+TEST_F(NodeTest, NobodyIsWokenForANodeThatNobodyWaitsFor) {
+    GraphText graph({"a"});
+    Executor executor(0, false);
+    graph["a"].Schedule(executor);
+    Faults().condBroadcast.Reset();
+    Execute(graph["a"], executor);
+    EXPECT_EQ(Faults().condBroadcast.Calls(), 0);
 }
 
 TEST_F(NodeTest, RunAllDoesNotWaitForNothing) {

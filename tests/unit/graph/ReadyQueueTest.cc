@@ -160,6 +160,30 @@ TEST_F(ReadyQueueTest, HeightOfANodeThatIsAloneIsNotAskedFor) {
     EXPECT_EQ(alone.Height(), 4);
 }
 
+// As above, but with nodes of which nobody has asked the height before.
+TEST_F(ReadyQueueTest, NodesOfUnknownHeightLeaveHighestAndOldestFirst) {
+    std::mt19937 random(20261123);
+    for (int round = 0; round < 2000; ++round) {
+        std::vector<std::pair<int, Node*>> ready;
+        for (int step = 0; step < 12; ++step) {
+            if (ready.empty() || random() % 3 != 0) {
+                const int height = 1 + static_cast<int>(random() % 4);
+                ready.emplace_back(height, &nodes.OfHeight(height));
+                queue.Push(*ready.back().second);
+                continue;
+            }
+            const auto first = std::max_element(
+                ready.begin(), ready.end(),
+                [](const auto& one, const auto& other) { return one.first < other.first; });
+            ASSERT_EQ(&queue.TakeHighest(0), first->second) << "round " << round;
+            ready.erase(first);
+        }
+        while (!queue.Empty()) {
+            queue.TakeHighest(0);
+        }
+    }
+}
+
 TEST_F(ReadyQueueTest, NodeThatWasAloneIsComparedWithTheNext) {
     TestNode& low = nodes.OfHeight(2);
     TestNode& high = nodes.OfHeight(3);
