@@ -150,6 +150,80 @@ def test_a_plugin_may_use_what_one_before_it_exports(root, vantor):
     assert root.ran() == ["shared"]
 
 
+# What the compiler's start-up code in every shared object asks for: declared by hand, as it does.
+START_UP = NOTING + """
+#include <stddef.h>
+__attribute__((weak)) void __gmon_start__(void);
+__attribute__((weak)) void _ITM_registerTMCloneTable(void*, size_t);
+__attribute__((weak)) void _ITM_deregisterTMCloneTable(void*);
+VANTOR_OPERATIONS(start);
+VANTOR_METADATA_1(NULL, NULL);
+"""
+# What that code does for an object with transactions in it.
+TRANSACTIONS = START_UP + """
+static char table[] = "table";
+__attribute__((constructor)) static void Load(void) { _ITM_registerTMCloneTable(table, 3); }
+__attribute__((destructor)) static void Unload(void) { _ITM_deregisterTMCloneTable(table); }
+VANTOR_METHOD(start) { Note("started\\n", 8); return 0; }
+"""
+
+TRANSACTION_LIBRARY = NOTING + """
+#include <stddef.h>
+void _ITM_registerTMCloneTable(void*, size_t);
+void _ITM_registerTMCloneTable(void* table, size_t count) {
+    Note(count == 3 && *(char*)table == 't' ? "registered\\n" : "something\\n", 11);
+}
+void _ITM_deregisterTMCloneTable(void*);
+void _ITM_deregisterTMCloneTable(void* table) {
+    Note(*(char*)table == 't' ? "deregistered\\n" : "somewhat else", 13);
+}
+"""
+
+
+def test_what_every_object_asks_the_linker_for_is_found_in_the_program(root, vantor):
+    root.compiled("x", START_UP + """
+        VANTOR_METHOD(start) {
+            if (__gmon_start__ && _ITM_registerTMCloneTable && _ITM_deregisterTMCloneTable) {
+                __gmon_start__();
+                Note("found\\n", 6);
+            }
+            return 0;
+        }""")
+    result = vantor()
+    assert (result.status, root.ran()) == (0, ["found"])
+
+
+def test_transactions_are_registered_with_the_library_that_a_plugin_before_brings(root, vantor):
+    root.compiled("library", TRANSACTION_LIBRARY + """
+        VANTOR_METHOD(start) { return 0; }
+        VANTOR_OPERATIONS(start);
+        VANTOR_METADATA_1(NULL, NULL);""")
+    root.compiled("user", TRANSACTIONS)
+    result = vantor("--plugin=liblibrary.so,libuser.so")
+    assert result.status == 0
+    assert root.ran() == ["registered", "started", "deregistered"]
+
+
+def test_transactions_are_registered_with_the_library_that_is_loaded_with_them(
+        root, vantor, tmp_path):
+    library = tmp_path / "libtransactions.so"
+    library.write_bytes(PluginFactory.compile(TRANSACTION_LIBRARY, "c",
+                                              "-Wl,-soname,libtransactions.so"))
+    root.write("/usr/libexec/vantor/libtransactions.so", library.read_bytes())
+    root.compiled("user", TRANSACTIONS, "c", "-Wl,--no-as-needed", str(library),
+                  "-Wl,-rpath,/usr/libexec/vantor")
+    result = vantor()
+    assert (result.status, result.messages) == (0, starting("user"))
+    assert root.ran() == ["registered", "started", "deregistered"]
+
+
+def test_transactions_of_a_plugin_without_their_library_are_nobodys(root, vantor):
+    root.compiled("user", TRANSACTIONS)
+    result = vantor()
+    assert (result.status, result.messages) == (0, starting("user"))
+    assert root.ran() == ["started"]
+
+
 def test_a_symbol_that_is_missing_is_met_only_when_it_is_called(root, vantor):
     root.compiled("lazy", """#include "vantor/plugin.h"
         void NowhereToBeFound(void);
