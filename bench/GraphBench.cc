@@ -93,8 +93,8 @@ void MeasureRuns(const std::vector<std::string>& words) {
     const bool isVantor = words.at(1) == "vantor";
     Executor executor(isVantor ? workers : 0, false);
     for (double& one : taken) {
-        one = isVantor ? RunVantor<EmptyNode>(shape, executor)
-                       : RunFlowGraph(shape, workers, false);
+        one =
+            isVantor ? RunVantor<EmptyNode>(shape, executor) : RunFlowGraph(shape, workers, false);
     }
     std::sort(taken.begin(), taken.end());
     Report(taken[taken.size() / 2]);
