@@ -9,9 +9,8 @@
 namespace vantor {
 
 // The one process-wide recursive mutex. It guards
-//   - every node's state, height and two adjacency lists, the count of those that are under way,
-//   and
-//     the barrier registry;
+//   - every node's state, height and two adjacency lists, and the barrier registry;
+//   - the count of nodes that are under way;
 //   - the executor's ready queue and its stop flag;
 //   - the creation of the run configuration and the host-profile answer.
 // It is never held while a plugin's method runs. Condition variables are waited on with it, by a

@@ -160,7 +160,7 @@ TEST_F(ReadyQueueTest, HeightOfANodeThatIsAloneIsNotAskedFor) {
     EXPECT_EQ(alone.Height(), 4);
 }
 
-// As above, but with nodes of which nobody has asked the height before.
+// Nobody has asked any of them for its height before.
 TEST_F(ReadyQueueTest, NodesOfUnknownHeightLeaveHighestAndOldestFirst) {
     std::mt19937 random(20261123);
     for (int round = 0; round < 2000; ++round) {
