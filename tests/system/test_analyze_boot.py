@@ -10,6 +10,7 @@ import termios
 import pytest
 
 from harness.sample_boot import DOT, LOG, SLEEPERS, lay_out
+from harness.terminal import written_on
 
 TREE = "/var/log/tree.dot"
 LONGEST = 400 + 500 + 600
@@ -206,8 +207,7 @@ def test_a_table_fits_the_terminal(analyze, boot, tmp_path):
     fcntl.ioctl(theirs, termios.TIOCSWINSZ, struct.pack("HHHH", 24, 90, 0, 0))
     done = analyze("blame", *boot, stdout=theirs)
     os.close(theirs)
-    lines = os.read(ours, 65536).decode().splitlines()
-    os.close(ours)
+    lines = written_on(ours).decode().splitlines()
     assert done.status == 0
     assert all(len(line) <= 90 for line in lines[1:]), lines
     assert lines[1].split("  ")[0] == "PLUGIN"

@@ -1,5 +1,6 @@
 """A pseudo-terminal for interactive runs, driven with pexpect."""
 
+import errno
 import io
 import os
 import pty
@@ -11,6 +12,22 @@ import pexpect.fdpexpect
 from harness.waiting import LIMIT_SECONDS
 
 LOCAL_MODES = 3  # the index of these flags in what tcgetattr() returns
+
+
+def written_on(master):
+    """Closes the operator's end and returns all that was written, once no other end is open.
+
+    One read() may return a part of it: the kernel passes on what is written piece by piece.
+    """
+    written = b""
+    with open(master, "rb", buffering=0) as operator:
+        while True:
+            try:
+                written += operator.read(1 << 16)
+            except OSError as error:
+                if error.errno != errno.EIO:  # what Linux says when no other end is open
+                    raise
+                return written
 
 
 class Terminal:
