@@ -84,7 +84,10 @@ void Executor::StopWorkers() {
 
 void Executor::Enqueue(Node& node) {
     queue.Push(node);
-    GlobalLock::Broadcast(workAvailable);
+    if (someSleep) {
+        someSleep = false;
+        GlobalLock::Broadcast(workAvailable);
+    }
 }
 
 std::size_t Executor::PickNext() const {
@@ -113,6 +116,7 @@ void Executor::RunWorker() {
         }
         GiveWay(guard);
         if (!HasReady() && !stopping) {
+            someSleep = true;
             GlobalLock::Wait(workAvailable);
         }
     }

@@ -18,7 +18,7 @@ class Node;
 // equals the one that has been ready longest, or a random one. One worker gives serial order.
 //
 // A run: construct the executor, Node::RunAll() the plugins in load order, destroy the executor.
-// The ready queue and the stop flag are guarded by GlobalLock; `threads` belongs to the thread that
+// The ready queue and both flags are guarded by GlobalLock; `threads` belongs to the thread that
 // constructs and destroys the executor.
 class Executor {
 public:
@@ -34,8 +34,8 @@ public:
     // never run.
     virtual ~Executor();
 
-    // Puts a node that has become ready into the queue and wakes the workers. Only for Node, which
-    // holds GlobalLock and has set the node's state; the node must outlive the executor.
+    // Puts a node that has become ready into the queue and wakes every worker that sleeps. Only for
+    // Node, which holds GlobalLock and has set the node's state; the node must outlive the executor.
     void Enqueue(Node& node);
 
     // Which node to run next: its position among the highest of the queue, counted from 0 in the
@@ -54,10 +54,14 @@ private:
     void StartWorkers(std::int32_t threadCount);
     void StopWorkers();
 
-    pthread_cond_t workAvailable;  // broadcast when a node is queued and when the pool stops
+    // What idle workers sleep on: broadcast when a node is queued and when the pool stops.
+    pthread_cond_t workAvailable;
     ReadyQueue queue;
     std::vector<pthread_t> threads;
     bool stopping = false;
+    // Whether a worker has gone to sleep since the last broadcast: if none has, nobody would hear
+    // another one. A whole boot is mostly requested before the first worker has the lock.
+    bool someSleep = false;
     bool randomize;
 };
 

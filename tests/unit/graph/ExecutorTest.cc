@@ -258,12 +258,30 @@ TEST_F(ExecutorTest, WakeUpWithoutReasonChangesNothing) {
     EXPECT_THAT(graph.Order(), ElementsAre("a"));
 }
 
-TEST_F(ExecutorTest, EveryWorkerIsWokenForEachQueuedNode) {
+TEST_F(ExecutorTest, EverySleepingWorkerIsWokenForEachQueuedNode) {
+    constexpr int workers = 4;
     GraphText graph({"a", "b", "c"});
-    Executor executor(0, false);
-    Faults().condBroadcast.Reset();
-    graph.Schedule(executor);
-    EXPECT_EQ(Faults().condBroadcast.Calls(), 3);
+    Executor executor(workers, false);
+    int sleeps = workers;
+    for (const char* const name : {"a", "b", "c"}) {
+        EXPECT_TRUE(WaitUntil([&] { return Faults().condWait.Calls() >= sleeps; }));
+        graph[name].Schedule(executor);
+        sleeps += workers;
+    }
+    EXPECT_TRUE(WaitUntil([&] { return Faults().condWait.Calls() >= sleeps; }));
+}
+
+TEST_F(ExecutorTest, WorkerIsWokenOnceForAllThatIsQueuedBeforeItHasTheLock) {
+    GraphText graph({"a", "b", "c"});
+    Executor executor(1, false);
+    EXPECT_TRUE(WaitUntil([] { return Faults().condWait.Calls() >= 1; }));
+    {
+        const GlobalLockGuard guard;
+        graph.Schedule(executor);
+        EXPECT_EQ(Faults().condBroadcast.Calls(), 1);
+    }
+    graph.WaitDone();
+    EXPECT_THAT(graph.Order(), ElementsAre("a", "b", "c"));
 }
 
 TEST_F(ExecutorTest, IdleWorkerGivesWayBeforeItSleeps) {
