@@ -96,6 +96,11 @@ def test_candidates_take_turns_in_turning_order():
     assert figures == {"a": [1, 6], "b": [2, 5], "c": [3, 4]}
 
 
+def test_what_varies_much_takes_more_rounds():
+    results = Results(rounds=2, quick=True)
+    assert results.alternate("more", {"a": lambda: 1}, times=3) == {"a": [1] * 6}
+
+
 def test_a_drawing_holds_every_point():
     drawn = svg(Curve("name", "A < B", "x", "y", {"one": [(1, 2), (10, 20)], "two": [(1, 3)]}))
     assert drawn.count("<circle") == 3

@@ -1,6 +1,7 @@
 """Group "commands": whole boots of debug plugins beside bare threads, ninja and make."""
 
 import statistics
+from functools import partial
 
 from harness.private_root import DEBUG_CONFIGURATION
 
@@ -69,15 +70,24 @@ def _check(host, shape, count):
     host.root.remove(LOG)
 
 
+def _mean(run, runs):
+    """Of a few runs in a row: sizes can be compared when each has seen as many commands.
+
+    A machine has quick and slow seconds: the median of short runs is that of the quick ones, and a
+    long run is a mean of both.
+    """
+    return tuple(statistics.mean(figures) for figures in zip(*(run() for _ in range(runs))))
+
+
 def _side_by_side(host, results, shape, counts):
     """Graphs that eight commands at a time work on, all sizes in the same rounds."""
     candidates = {}
     for count in counts:
         case = _Case(host, shape, count)
-        candidates["vantor", count] = lambda case=case: case.vantor("--parallel")
-        candidates["bare", count] = lambda case=case: case.bare(8)
-        candidates["ninja", count] = case.ninja
-        candidates["make", count] = case.make
+        for name, run in (("vantor", lambda case=case: case.vantor("--parallel")),
+                          ("bare", lambda case=case: case.bare(8)),
+                          ("ninja", case.ninja), ("make", case.make)):
+            candidates[name, count] = partial(_mean, run, counts[-1] // count)
     measured = results.alternate(f"{GROUP}: {shape}", candidates)
     figures, processor = _by_clock(measured), _by_processor(measured)
     for count in counts:
@@ -126,10 +136,10 @@ def _one_by_one(host, results, count):
     measured = results.alternate(f"{GROUP}: one at a time", {
         "chain": lambda: chain.vantor("--parallel"),
         "bare": lambda: chain.bare(1),
+        "serial": alone.vantor,
         "ninja": chain.ninja,
         "make": chain.make,
-        "serial": alone.vantor,
-    })
+    }, times=3)
     figures, processor = _by_clock(measured), _by_processor(measured)
     for name, label, limit in (("bare", "1 bare thread", 1.08), ("ninja", "ninja -j8", 1.03),
                                ("make", "make -j8", None)):

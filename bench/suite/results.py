@@ -89,15 +89,17 @@ class Results:
         self.rounds, self.quick = rounds, quick
         self.progress, self.rows, self.curves, self.failures = Progress(), [], [], []
 
-    def alternate(self, what, candidates):
+    def alternate(self, what, candidates, times=1):
         """Measures every candidate once a round, in turning order; a list of figures for each.
 
         candidates  name -> function that measures once and returns the figure
+        times       so many times as many rounds as elsewhere, for what varies much and is short
         """
+        rounds = times * self.rounds
         figures = {name: [] for name in candidates}
         order = list(candidates)
-        for number in range(self.rounds):
-            self.progress.say(f"{what}, round {number + 1} of {self.rounds}")
+        for number in range(rounds):
+            self.progress.say(f"{what}, round {number + 1} of {rounds}")
             for name in order if number % 2 == 0 else reversed(order):
                 figures[name].append(candidates[name]())
         return figures
