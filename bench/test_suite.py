@@ -101,6 +101,21 @@ def test_what_varies_much_takes_more_rounds():
     assert results.alternate("more", {"a": lambda: 1}, times=3) == {"a": [1] * 6}
 
 
+def test_the_figure_of_a_round_is_the_mean_of_its_turns():
+    order = []
+    results = Results(rounds=1, quick=True)
+    figures = results.alternate("turns", {name: lambda name=name: order.append(name) or len(order)
+                                          for name in "abc"}, often={"a": 3, "c": 2})
+    assert order == list("abccaa")
+    assert figures == {"a": [(1 + 5 + 6) / 3], "b": [2], "c": [3.5]}
+
+
+def test_figures_that_belong_together_are_averaged_place_by_place():
+    runs = iter([(1, 10), (3, 30)])
+    results = Results(rounds=1, quick=True)
+    assert results.alternate("pairs", {"a": lambda: next(runs)}, often={"a": 2}) == {"a": [(2, 20)]}
+
+
 def test_a_drawing_holds_every_point():
     drawn = svg(Curve("name", "A < B", "x", "y", {"one": [(1, 2), (10, 20)], "two": [(1, 3)]}))
     assert drawn.count("<circle") == 3

@@ -1,7 +1,6 @@
 """Group "commands": whole boots of debug plugins beside bare threads, ninja and make."""
 
 import statistics
-from functools import partial
 
 from harness.private_root import DEBUG_CONFIGURATION
 
@@ -70,25 +69,21 @@ def _check(host, shape, count):
     host.root.remove(LOG)
 
 
-def _mean(run, runs):
-    """Of a few runs in a row: sizes can be compared when each has seen as many commands.
+def _side_by_side(host, results, shape, counts):
+    """Graphs that eight commands at a time work on, all sizes in the same rounds.
 
     A machine has quick and slow seconds: the median of short runs is that of the quick ones, and a
-    long run is a mean of both.
+    long run is a mean of both. Sizes can be compared when a round of each sees as many of them.
     """
-    return tuple(statistics.mean(figures) for figures in zip(*(run() for _ in range(runs))))
-
-
-def _side_by_side(host, results, shape, counts):
-    """Graphs that eight commands at a time work on, all sizes in the same rounds."""
-    candidates = {}
+    candidates, often = {}, {}
     for count in counts:
         case = _Case(host, shape, count)
-        for name, run in (("vantor", lambda case=case: case.vantor("--parallel")),
-                          ("bare", lambda case=case: case.bare(8)),
-                          ("ninja", case.ninja), ("make", case.make)):
-            candidates[name, count] = partial(_mean, run, counts[-1] // count)
-    measured = results.alternate(f"{GROUP}: {shape}", candidates)
+        candidates["vantor", count] = lambda case=case: case.vantor("--parallel")
+        candidates["bare", count] = lambda case=case: case.bare(8)
+        candidates["ninja", count] = case.ninja
+        candidates["make", count] = case.make
+        often["vantor", count] = often["bare", count] = 2 * counts[-1] // count
+    measured = results.alternate(f"{GROUP}: {shape}", candidates, often=often)
     figures, processor = _by_clock(measured), _by_processor(measured)
     for count in counts:
         ours = ("vantor --parallel", figures["vantor", count])

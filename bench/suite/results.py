@@ -82,6 +82,13 @@ class Progress:
             sys.stderr.write("\n")
 
 
+def _mean(values):
+    """Of figures, or of tuples of figures place by place."""
+    if isinstance(values[0], tuple):
+        return tuple(statistics.mean(figures) for figures in zip(*values))
+    return statistics.mean(values)
+
+
 class Results:
     """Collects the rows and curves of all groups; the groups measure through it."""
 
@@ -89,19 +96,26 @@ class Results:
         self.rounds, self.quick = rounds, quick
         self.progress, self.rows, self.curves, self.failures = Progress(), [], [], []
 
-    def alternate(self, what, candidates, times=1):
+    def alternate(self, what, candidates, times=1, often=None):
         """Measures every candidate once a round, in turning order; a list of figures for each.
 
-        candidates  name -> function that measures once and returns the figure
+        candidates  name -> function that measures once and returns the figure, or a tuple of figures
         times       so many times as many rounds as elsewhere, for what varies much and is short
+        often       name -> so many times a round instead of once, each time with the others in
+                    turn: the figure of the round is the mean
         """
-        rounds = times * self.rounds
+        rounds, often = times * self.rounds, often or {}
+        turns = max(often.values(), default=1)
         figures = {name: [] for name in candidates}
-        order = list(candidates)
         for number in range(rounds):
             self.progress.say(f"{what}, round {number + 1} of {rounds}")
-            for name in order if number % 2 == 0 else reversed(order):
-                figures[name].append(candidates[name]())
+            taken = {name: [] for name in candidates}
+            for turn in range(turns):
+                order = [name for name in candidates if turn < often.get(name, 1)]
+                for name in order if (number * turns + turn) % 2 == 0 else reversed(order):
+                    taken[name].append(candidates[name]())
+            for name, values in taken.items():
+                figures[name].append(_mean(values))
         return figures
 
     def figure(self, group, work, subject, values, unit):
