@@ -44,10 +44,21 @@ function(vantor_install_documents component)
     endif()
 endfunction()
 
+# vantor_install_binaries(<component> <destination> <target>...): what is installed lies in the
+# system's own folders and finds its libraries there.
+function(vantor_install_binaries component destination)
+    install(TARGETS ${ARGN} DESTINATION ${destination} COMPONENT ${component})
+    foreach(target IN LISTS ARGN)
+        set(installed "\$ENV{DESTDIR}\${CMAKE_INSTALL_PREFIX}/${destination}")
+        install(CODE "file(RPATH_REMOVE FILE \"${installed}/$<TARGET_FILE_NAME:${target}>\")"
+            COMPONENT ${component})
+    endforeach()
+endfunction()
+
 # vantor: the program, the one that looks at its boots, and all that the host boots it with.
-install(TARGETS vantor RUNTIME DESTINATION sbin COMPONENT vantor)
+vantor_install_binaries(vantor sbin vantor)
 if(TARGET vantor-analyze)
-    install(TARGETS vantor-analyze RUNTIME DESTINATION sbin COMPONENT vantor)
+    vantor_install_binaries(vantor sbin vantor-analyze)
 endif()
 install(DIRECTORY DESTINATION libexec/vantor/plugins COMPONENT vantor)
 install(PROGRAMS ${vantorPackaging}/vantor.init DESTINATION /etc/init.d
@@ -60,9 +71,8 @@ vantor_install_documents(vantor)
 
 # vantor-hostlibs: what a host that has libraries of its own does without.
 if(TARGET nvcli)
-    install(TARGETS nvkctl nvkuser basekit
-        LIBRARY DESTINATION ${vantorLibraryFolder} COMPONENT vantor-hostlibs)
-    install(TARGETS nvcli RUNTIME DESTINATION bin COMPONENT vantor-hostlibs)
+    vantor_install_binaries(vantor-hostlibs ${vantorLibraryFolder} nvkctl nvkuser basekit)
+    vantor_install_binaries(vantor-hostlibs bin nvcli)
     # Each of the folders in which commands are looked for; a missing one is reported at every boot.
     install(DIRECTORY DESTINATION lib/nuvex/nvcli/int/ext COMPONENT vantor-hostlibs)
     install(DIRECTORY DESTINATION lib/nuvex/nvcli/ext COMPONENT vantor-hostlibs)

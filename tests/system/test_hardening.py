@@ -42,3 +42,9 @@ def test_calls_of_the_c_library_are_checked(readelf, session):
 
 def test_no_code_is_changed_when_it_is_loaded(readelf):
     assert "TEXTREL" not in readelf("-d")
+
+
+def test_no_library_is_read_from_the_working_directory(root, vantor):
+    root.write("/tmp/libstdc++.so.6", "no library")
+    result = vantor("--help", cwd="/tmp")
+    assert (result.status, result.stderr) == (0, "")
