@@ -2,6 +2,7 @@
 
 #include <sched.h>
 
+#include <chrono>
 #include <cstdlib>
 #include <memory>
 #include <string>
@@ -20,9 +21,10 @@ struct WorkerStart {
     std::int32_t index;
 };
 
-// Every node that is queued wakes all idle workers, and mostly all but one in vain. Back to sleep
-// at once, they would be there to be woken for the very next node, at many times the cost of a
-// short one. So they first let others have the processor, and look again.
+// Every node that is queued wakes all idle workers, and mostly all but one in vain. Where one short
+// node follows the other, a worker that went back to sleep at once would be there to be woken for
+// the very next one, at many times the cost of the node. So it first lets others have the
+// processor, and looks again.
 void GiveWay(GlobalLockGuard& guard) {
     constexpr int turns = 3;
     guard.Release();
@@ -107,6 +109,7 @@ void* Executor::WorkerEntry(void* argument) {
 
 void Executor::RunWorker() {
     GlobalLockGuard guard;
+    bool sleptBriefly = false;
     while (!stopping) {
         while (HasReady()) {
             TakeNext().Execute(*this, guard);
@@ -114,12 +117,22 @@ void Executor::RunWorker() {
                 return;
             }
         }
-        GiveWay(guard);
+        // While plugins take their time the processor is theirs.
+        if (sleptBriefly) {
+            GiveWay(guard);
+        }
         if (!HasReady() && !stopping) {
-            someSleep = true;
-            GlobalLock::Wait(workAvailable);
+            sleptBriefly = SleepUntilWoken();
         }
     }
+}
+
+bool Executor::SleepUntilWoken() {
+    constexpr std::chrono::microseconds brief{50};
+    const auto start = std::chrono::steady_clock::now();
+    someSleep = true;
+    GlobalLock::Wait(workAvailable);
+    return std::chrono::steady_clock::now() - start < brief;
 }
 
 }  // namespace vantor

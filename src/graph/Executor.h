@@ -52,6 +52,8 @@ public:
 private:
     static void* WorkerEntry(void* argument);
     void RunWorker();
+    // Returns whether that was soon: within about the time that falling asleep and waking up take.
+    bool SleepUntilWoken();
     void StartWorkers(std::int32_t threadCount);
     void StopWorkers();
 

@@ -5,6 +5,7 @@
 
 #include <algorithm>
 #include <atomic>
+#include <chrono>
 #include <thread>
 
 #include "graph/GlobalLock.h"
@@ -284,55 +285,66 @@ TEST_F(ExecutorTest, WorkerIsWokenOnceForAllThatIsQueuedBeforeItHasTheLock) {
     EXPECT_THAT(graph.Order(), ElementsAre("a", "b", "c"));
 }
 
-TEST_F(ExecutorTest, IdleWorkerGivesWayBeforeItSleeps) {
-    std::atomic<int> yieldsBeforeSleep{-1};
-    Faults().condWait.Before([&] { yieldsBeforeSleep = Faults().yield.Calls(); });
+TEST_F(ExecutorTest, WorkerThatSleptLongSleepsAgainAtOnce) {
+    Faults().condWait.FailCall(1, 0);
+    Faults().condWait.Before([] { std::this_thread::sleep_for(std::chrono::milliseconds(1)); });
     const Executor executor(1, false);
-    EXPECT_TRUE(WaitUntil([&] { return yieldsBeforeSleep >= 0; }));
-    EXPECT_GT(yieldsBeforeSleep, 0);
+    EXPECT_TRUE(WaitUntil([] { return Faults().condWait.Calls() >= 2; }));
+    EXPECT_EQ(Faults().yield.Calls(), 0);
 }
 
-TEST_F(ExecutorTest, WorkerThatGivesWayDoesNotHoldTheLock) {
-    std::atomic<bool> held{false};
-    Faults().yield.Before([&] { held = held || GlobalLock::HeldByCurrentThread(); });
+// Every wait ends at once: a worker sleeps briefly, again and again.
+class BriefSleepTest : public ExecutorTest {
+protected:
+    BriefSleepTest() {
+        Faults().condWait.FailFrom(1, 0);
+        Faults().yield.Before([this] { GiveWay(); });
+    }
+
+    // What a worker does that gives way. The first time it stays there until `resumed`.
+    void GiveWay() {
+        if (!givingWay) {
+            heldLock = GlobalLock::HeldByCurrentThread();
+            sleepsBefore = Faults().condWait.Calls();
+            givingWay = true;
+            EXPECT_TRUE(WaitUntil([this] { return resumed.load(); }));
+        }
+    }
+
+    std::atomic<bool> heldLock{false};
+    std::atomic<int> sleepsBefore{0};
+    std::atomic<bool> givingWay{false};
+    std::atomic<bool> resumed{false};
+};
+
+TEST_F(BriefSleepTest, WorkerThatGivesWayDoesNotHoldTheLock) {
     const Executor executor(1, false);
-    EXPECT_TRUE(WaitUntil([] { return Faults().condWait.Calls() > 0; }));
-    EXPECT_GT(Faults().yield.Calls(), 0);
-    EXPECT_FALSE(held);
+    EXPECT_TRUE(WaitUntil([&] { return givingWay.load(); }));
+    EXPECT_GT(sleepsBefore, 0);
+    EXPECT_FALSE(heldLock);
+    resumed = true;
 }
 
 // The plugin is requested while nobody sleeps: no broadcast would wake the worker for it later.
-TEST_F(ExecutorTest, WorkerThatGivesWayTakesWhatIsQueuedMeanwhileWithoutSleeping) {
+TEST_F(BriefSleepTest, WorkerThatGivesWayTakesWhatIsQueuedMeanwhileWithoutSleeping) {
     GraphText graph({"a"});
-    std::atomic<bool> givingWay{false};
-    std::atomic<bool> requested{false};
-    Faults().yield.Before([&] {
-        givingWay = true;
-        EXPECT_TRUE(WaitUntil([&] { return requested.load(); }));
-    });
-    std::atomic<bool> sleptBefore{false};
-    graph["a"].onRun = [&] { sleptBefore = Faults().condWait.Calls() > 0; };
+    std::atomic<int> sleepsUntilRun{-1};
+    graph["a"].onRun = [&] { sleepsUntilRun = Faults().condWait.Calls(); };
     Executor executor(1, false);
     EXPECT_TRUE(WaitUntil([&] { return givingWay.load(); }));
     graph.Schedule(executor);
-    requested = true;
+    resumed = true;
     EXPECT_TRUE(WaitUntil([&] { return graph["a"].State() == NodeState::Done; }));
-    EXPECT_FALSE(sleptBefore);
+    EXPECT_EQ(sleepsUntilRun, sleepsBefore);
 }
 
-TEST_F(ExecutorTest, WorkerThatGivesWayWhileThePoolStopsLeavesWithoutSleeping) {
-    std::atomic<bool> givingWay{false};
-    std::atomic<bool> joining{false};
-    Faults().yield.Before([&] {
-        givingWay = true;
-        EXPECT_TRUE(WaitUntil([&] { return joining.load(); }));
-    });
-    Faults().threadJoin.Before([&] { joining = true; });
+TEST_F(BriefSleepTest, WorkerThatGivesWayWhileThePoolStopsLeavesWithoutSleeping) {
+    Faults().threadJoin.Before([&] { resumed = true; });
     {
         const Executor executor(1, false);
         EXPECT_TRUE(WaitUntil([&] { return givingWay.load(); }));
     }
-    EXPECT_EQ(Faults().condWait.Calls(), 0);
+    EXPECT_EQ(Faults().condWait.Calls(), sleepsBefore);
 }
 
 TEST_F(ExecutorTest, SecondExecutorRunsWhatTheFirstLeft) {
