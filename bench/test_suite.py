@@ -106,8 +106,16 @@ def test_the_figure_of_a_round_is_the_mean_of_its_turns():
     results = Results(rounds=1, quick=True)
     figures = results.alternate("turns", {name: lambda name=name: order.append(name) or len(order)
                                           for name in "abc"}, often={"a": 3, "c": 2})
-    assert order == list("abccaa")
-    assert figures == {"a": [(1 + 5 + 6) / 3], "b": [2], "c": [3.5]}
+    assert order == list("abc" "a" "ac")
+    assert figures == {"a": [(1 + 4 + 5) / 3], "b": [2], "c": [4.5]}
+
+
+def test_candidates_change_their_places_from_round_to_round_however_many_turns_there_are():
+    order = []
+    results = Results(rounds=2, quick=True)
+    results.alternate("turns", {name: lambda name=name: order.append(name) or len(order)
+                                for name in "ab"}, often={"a": 2})
+    assert order == list("ab" "a" "ba" "a")
 
 
 def test_figures_that_belong_together_are_averaged_place_by_place():

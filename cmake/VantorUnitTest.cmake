@@ -27,7 +27,7 @@ function(vantor_unit_test name)
     target_compile_options(${name} PRIVATE ${unitTestOptions})
     set_target_properties(${name} PROPERTIES
         RUNTIME_OUTPUT_DIRECTORY ${PROJECT_BINARY_DIR}/bin/tests
-        INSTALL_RPATH "$ORIGIN/../../lib")
+        INSTALL_RPATH "$ORIGIN/../../lib;${VANTOR_HOSTLIBS_DIR}")
     gtest_discover_tests(${name}
         DISCOVERY_TIMEOUT 60
         PROPERTIES TIMEOUT 300)

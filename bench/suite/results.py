@@ -97,12 +97,12 @@ class Results:
         self.progress, self.rows, self.curves, self.failures = Progress(), [], [], []
 
     def alternate(self, what, candidates, times=1, often=None):
-        """Measures every candidate once a round, in turning order; a list of figures for each.
+        """Measures the candidates in rounds, in turning order; a list of the rounds' figures for each.
 
         candidates  name -> function that measures once and returns the figure, or a tuple of figures
-        times       so many times as many rounds as elsewhere, for what varies much and is short
-        often       name -> so many times a round instead of once, each time with the others in
-                    turn: the figure of the round is the mean
+        times       factor on the number of rounds, for what varies much and is short
+        often       name -> how often a round measures it, once where nothing is said: in turn with
+                    the others and spread over the round, whose figure is the mean
         """
         rounds, often = times * self.rounds, often or {}
         turns = max(often.values(), default=1)
@@ -111,8 +111,8 @@ class Results:
             self.progress.say(f"{what}, round {number + 1} of {rounds}")
             taken = {name: [] for name in candidates}
             for turn in range(turns):
-                order = [name for name in candidates if turn < often.get(name, 1)]
-                for name in order if (number * turns + turn) % 2 == 0 else reversed(order):
+                order = [name for name in candidates if turn * often.get(name, 1) % turns < often.get(name, 1)]
+                for name in order if (number + turn) % 2 == 0 else reversed(order):
                     taken[name].append(candidates[name]())
             for name, values in taken.items():
                 figures[name].append(_mean(values))

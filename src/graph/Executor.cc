@@ -117,7 +117,7 @@ void Executor::RunWorker() {
                 return;
             }
         }
-        // While plugins take their time the processor is theirs.
+        // After a long sleep nodes come seldom, and giving way only takes processor time from them.
         if (sleptBriefly) {
             GiveWay(guard);
         }

@@ -18,8 +18,8 @@ class Node;
 // equals the one that has been ready longest, or a random one. One worker gives serial order.
 //
 // A run: construct the executor, Node::RunAll() the plugins in load order, destroy the executor.
-// The ready queue and both flags are guarded by GlobalLock; `threads` belongs to the thread that
-// constructs and destroys the executor.
+// The ready queue, `stopping` and `someSleep` are guarded by GlobalLock; `threads` belongs to the
+// thread that constructs and destroys the executor.
 class Executor {
 public:
     // Starts `threadCount` workers; none when it is below 1, and then no node is ever run. With
@@ -52,12 +52,14 @@ public:
 private:
     static void* WorkerEntry(void* argument);
     void RunWorker();
-    // Returns whether that was soon: within about the time that falling asleep and waking up take.
+    // Returns whether it was woken soon: within about the time that falling asleep and waking up
+    // take.
     bool SleepUntilWoken();
     void StartWorkers(std::int32_t threadCount);
     void StopWorkers();
 
-    // What idle workers sleep on: broadcast when a node is queued and when the pool stops.
+    // What idle workers sleep on: broadcast when a node is queued, if one may sleep, and when the
+    // pool stops.
     pthread_cond_t workAvailable;
     ReadyQueue queue;
     std::vector<pthread_t> threads;

@@ -11,7 +11,7 @@ namespace vantor {
 // The one process-wide recursive mutex. It guards
 //   - every node's state, height and two adjacency lists, and the barrier registry;
 //   - the count of nodes that are under way;
-//   - the executor's ready queue and its stop flag;
+//   - the executor's ready queue, and its flags for stopping and for sleeping workers;
 //   - the creation of the run configuration and the host-profile answer.
 // It is never held while a plugin's method runs. Condition variables are waited on with it, by a
 // thread that holds it once.

@@ -1,5 +1,6 @@
 """The program is built so that a flaw in it is hard to exploit, whatever flags a build forgets."""
 
+import os
 import re
 import subprocess
 
@@ -42,6 +43,19 @@ def test_calls_of_the_c_library_are_checked(readelf, session):
 
 def test_no_code_is_changed_when_it_is_loaded(readelf):
     assert "TEXTREL" not in readelf("-d")
+
+
+@pytest.mark.parametrize("name", ["bin/vantor", "bin/vantor-analyze", "bin/nvcli",
+                                  "lib/libnvkctl.so", "lib/libnvkuser.so", "lib/libbasekit.so"])
+def test_libraries_are_looked_for_in_folders_that_have_a_name(session, name):
+    file = os.path.join(session.base.build, name)
+    if not os.path.exists(file):
+        pytest.skip("not built here: the thread sanitizer or the host's own libraries")
+    dynamic = subprocess.run(["readelf", "-dW", file], check=True, capture_output=True,
+                             text=True).stdout
+    [path] = re.findall(r"\(RUNPATH\).*\[(.*)\]", dynamic)
+    assert "$ORIGIN/../lib" in path.split(":")
+    assert all(folder.startswith(("/", "$ORIGIN")) for folder in path.split(":"))
 
 
 def test_no_library_is_read_from_the_working_directory(root, vantor):

@@ -23,11 +23,14 @@ def written_on(master):
     with open(master, "rb", buffering=0) as operator:
         while True:
             try:
-                written += operator.read(1 << 16)
+                piece = operator.read(1 << 16)
             except OSError as error:
                 if error.errno != errno.EIO:  # what Linux says when no other end is open
                     raise
                 return written
+            if not piece:
+                return written
+            written += piece
 
 
 class Terminal:

@@ -148,7 +148,8 @@ TEST_F(ExecutorTest, EightWorkersRunEightPluginsAtOnceAndNeverMore) {
     for (const char* const name : {"a", "b", "c", "d", "e", "f", "g", "h", "i", "j", "k", "l"}) {
         graph[name].onRun = [&] {
             const int now = ++running;
-            most = std::max(most.load(), now);
+            for (int seen = most; seen < now && !most.compare_exchange_weak(seen, now);) {
+            }
             EXPECT_TRUE(WaitUntil([&] { return most >= 8; }));
             --running;
         };

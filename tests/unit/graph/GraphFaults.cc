@@ -64,8 +64,13 @@ int __wrap_pthread_join(pthread_t thread, void** result) {
 }
 
 int __wrap_pthread_cond_wait(pthread_cond_t* condition, pthread_mutex_t* mutex) {
-    return Faults().condWait.Fails() ? Faults().condWait.Error()
-                                     : __real_pthread_cond_wait(condition, mutex);
+    if (!Faults().condWait.Fails()) {
+        return __real_pthread_cond_wait(condition, mutex);
+    }
+    // Others can take the mutex while a thread waits, also where the wait ends at once.
+    pthread_mutex_unlock(mutex);
+    pthread_mutex_lock(mutex);
+    return Faults().condWait.Error();
 }
 
 int __wrap_pthread_cond_broadcast(pthread_cond_t* condition) {
