@@ -97,21 +97,22 @@ class Results:
         self.progress, self.rows, self.curves, self.failures = Progress(), [], [], []
 
     def alternate(self, what, candidates, times=1, often=None):
-        """Measures the candidates in rounds, in turning order; a list of the rounds' figures for each.
+        """Measures the candidates in rounds, in turning order; a list of figures for each.
 
         candidates  name -> function that measures once and returns the figure, or a tuple of figures
         times       factor on the number of rounds, for what varies much and is short
         often       name -> how often a round measures it, once where nothing is said: in turn with
                     the others and spread over the round, whose figure is the mean
         """
-        rounds, often = times * self.rounds, often or {}
-        turns = max(often.values(), default=1)
+        rounds = times * self.rounds
+        counts = {name: (often or {}).get(name, 1) for name in candidates}
+        turns = max(counts.values())
         figures = {name: [] for name in candidates}
         for number in range(rounds):
             self.progress.say(f"{what}, round {number + 1} of {rounds}")
             taken = {name: [] for name in candidates}
             for turn in range(turns):
-                order = [name for name in candidates if turn * often.get(name, 1) % turns < often.get(name, 1)]
+                order = [name for name, count in counts.items() if turn * count % turns < count]
                 for name in order if (number + turn) % 2 == 0 else reversed(order):
                     taken[name].append(candidates[name]())
             for name, values in taken.items():
