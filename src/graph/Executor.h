@@ -35,8 +35,8 @@ public:
     virtual ~Executor();
 
     // Puts a node that has become ready into the queue and wakes every worker that sleeps. Only for
-    // Node, which holds GlobalLock and has set the node's state; the node must outlive the
-    // executor.
+    // Node, which holds GlobalLock and has set the node's state; the node must live until it is
+    // done or the executor is gone.
     void Enqueue(Node& node);
 
     // Which node to run next: its position among the highest of the queue, counted from 0 in the

@@ -15,19 +15,19 @@ void Pause(int length) {
     }
 }
 
-// What is done under the lock mostly takes far less than a microsecond. Who finds it taken
+// What is done under the lock mostly takes far less than a microsecond. Who has found it taken
 // therefore tries again for about as long as going to sleep and being woken may take, and so spares
 // itself that, and the holder the system call that wakes. The pauses double: the trying is to
 // disturb the holder little.
-void Acquire(pthread_mutex_t& mutex) {
+void AcquireTaken(pthread_mutex_t& mutex) {
     constexpr int tries = 10;
     constexpr int longestPause = 128;
-    for (int i = 0, pause = 1; i < tries; ++i) {
+    for (int i = 1, pause = 1; i < tries; ++i) {
+        Pause(pause);
+        pause = std::min(2 * pause, longestPause);
         if (pthread_mutex_trylock(&mutex) == 0) {
             return;
         }
-        Pause(pause);
-        pause = std::min(2 * pause, longestPause);
     }
     pthread_mutex_lock(&mutex);
 }
@@ -39,7 +39,9 @@ std::atomic<std::int32_t> GlobalLock::holdCount{0};
 std::atomic<pthread_t> GlobalLock::holder{};
 
 void GlobalLock::Lock() {
-    Acquire(mutex);
+    if (pthread_mutex_trylock(&mutex) != 0) {
+        AcquireTaken(mutex);
+    }
     RecordHolder(holdCount.load(std::memory_order_relaxed) + 1);
 }
 
@@ -67,22 +69,6 @@ void GlobalLock::RecordHolder(std::int32_t count) {
 bool GlobalLock::HeldByCurrentThread() {
     return holdCount.load(std::memory_order_acquire) >= 1 &&
            pthread_equal(holder.load(std::memory_order_relaxed), pthread_self()) != 0;
-}
-
-GlobalLockGuard::~GlobalLockGuard() {
-    if (held) {
-        GlobalLock::Unlock();
-    }
-}
-
-void GlobalLockGuard::Release() {
-    held = false;
-    GlobalLock::Unlock();
-}
-
-void GlobalLockGuard::Retake() {
-    GlobalLock::Lock();
-    held = true;
 }
 
 }  // namespace vantor

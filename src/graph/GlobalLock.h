@@ -46,14 +46,25 @@ private:
 class GlobalLockGuard {
 public:
     GlobalLockGuard() { GlobalLock::Lock(); }
-    ~GlobalLockGuard();
+    ~GlobalLockGuard() {
+        if (held) {
+            GlobalLock::Unlock();
+        }
+    }
     GlobalLockGuard(const GlobalLockGuard&) = delete;
     GlobalLockGuard& operator=(const GlobalLockGuard&) = delete;
 
     // Must be held by this guard.
-    void Release();
+    void Release() {
+        held = false;
+        GlobalLock::Unlock();
+    }
+
     // Must have been released.
-    void Retake();
+    void Retake() {
+        GlobalLock::Lock();
+        held = true;
+    }
 
 private:
     bool held = true;

@@ -61,32 +61,30 @@ void Node::Schedule(Executor& executor) {
 
 void Node::ScheduleLocked(Executor& executor) {
     if (state == NodeState::Idle) {
-        Request(executor);
+        BecomeWaiting();
+        if (Node* const idle = NextIdleDependency()) {
+            RequestBelow(*idle, executor);
+        } else {
+            EndRequest(executor);
+        }
     } else if (state == NodeState::Waiting) {
         QueueIfReady(executor);
     }
 }
 
 // Depth first, in the order of the lists: a dependency that nobody has requested yet is requested,
-// with all that it waits for, before the next one is looked at.
-void Node::Request(Executor& executor) {
-    std::vector<Node*> requesters;
-    Node* node = this;
-    node->BecomeWaiting();
-    for (;;) {
-        if (Node* const idle = node->NextIdleDependency()) {
-            requesters.push_back(node);
-            node = idle;
-            node->BecomeWaiting();
-            continue;
+// with all that it waits for, before the next one is looked at. This node's own request ends here.
+void Node::RequestBelow(Node& firstIdle, Executor& executor) {
+    std::vector<Node*> requesting{this};
+    for (Node* idle = &firstIdle; !requesting.empty();) {
+        if (idle != nullptr) {
+            idle->BecomeWaiting();
+            requesting.push_back(idle);
+        } else {
+            requesting.back()->EndRequest(executor);
+            requesting.pop_back();
         }
-        node->settled = 0;
-        node->QueueIfReady(executor);
-        if (requesters.empty()) {
-            return;
-        }
-        node = requesters.back();
-        requesters.pop_back();
+        idle = requesting.empty() ? nullptr : requesting.back()->NextIdleDependency();
     }
 }
 
@@ -104,6 +102,11 @@ Node* Node::NextIdleDependency() {
         }
     }
     return nullptr;
+}
+
+void Node::EndRequest(Executor& executor) {
+    settled = 0;
+    QueueIfReady(executor);
 }
 
 // A dependency that is done stays so: none is looked at again.
@@ -155,13 +158,6 @@ void Node::MarkDone() {
 std::int32_t Node::Height() {
     const GlobalLockGuard guard;
     return HeightLocked();
-}
-
-std::int32_t Node::HeightLocked() {
-    if (!heightKnown) {
-        ComputeHeight();
-    }
-    return height;
 }
 
 // Depth first. While a node is under way its height is that of the highest dependent seen so far,

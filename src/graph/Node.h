@@ -116,9 +116,15 @@ private:
     // The caller of any of these holds the lock.
     void ScheduleLocked(Executor& executor);
     void WaitDoneLocked();
-    std::int32_t HeightLocked();
-    void Request(Executor& executor);
+    std::int32_t HeightLocked() {
+        if (!heightKnown) {
+            ComputeHeight();
+        }
+        return height;
+    }
+    void RequestBelow(Node& firstIdle, Executor& executor);
     void BecomeWaiting();
+    void EndRequest(Executor& executor);
     Node* NextIdleDependency();
     void QueueIfReady(Executor& executor);
     void ComputeHeight();

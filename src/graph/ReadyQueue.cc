@@ -18,11 +18,7 @@ void ReadyQueue::Push(Node& node) {
         highestHeight = highest.first->HeightLocked();
     }
     const std::int32_t height = node.HeightLocked();
-    if (height > highestHeight) {
-        MakeRow(lower.cbegin(), highestHeight) = std::exchange(highest, Row());
-        highestHeight = height;
-    }
-    Append(height == highestHeight ? highest : LowerRow(height), node);
+    Append(height == highestHeight ? highest : OtherRow(height), node);
 }
 
 Node& ReadyQueue::TakeHighest(std::size_t position) {
@@ -45,7 +41,12 @@ Node& ReadyQueue::TakeHighest(std::size_t position) {
     return *taken;
 }
 
-ReadyQueue::Row& ReadyQueue::LowerRow(std::int32_t height) {
+ReadyQueue::Row& ReadyQueue::OtherRow(std::int32_t height) {
+    if (height > highestHeight) {
+        MakeRow(lower.cbegin(), highestHeight) = std::exchange(highest, Row());
+        highestHeight = height;
+        return highest;
+    }
     const auto found = lower.lower_bound(height);
     return found != lower.end() && found->first == height ? found->second : MakeRow(found, height);
 }

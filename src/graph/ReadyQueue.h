@@ -14,8 +14,8 @@ class Node;
 // take from, so that a choice costs the same however many nodes wait. Within a row they stand in
 // the order in which they became ready.
 //
-// The rows are chained through the nodes themselves, which must outlive the queue and be in no
-// other. Guarded by GlobalLock: whoever calls an operation holds it.
+// The rows are chained through the nodes themselves, which must live as long as they are in it and
+// be in no other. Guarded by GlobalLock: whoever calls an operation holds it.
 class ReadyQueue {
 public:
     bool Empty() const { return highest.count == 0; }
@@ -39,7 +39,7 @@ private:
     };
     using Rows = std::map<std::int32_t, Row, std::greater<>>;
 
-    Row& LowerRow(std::int32_t height);  // made if there is none
+    Row& OtherRow(std::int32_t height);  // than the highest there is; made if there is none
     Row& MakeRow(Rows::const_iterator before, std::int32_t height);
     static void Append(Row& row, Node& node);
 
