@@ -1,15 +1,13 @@
+#include "FlowGraph.h"
+
 #include <tbb/flow_graph.h>
-#include <tbb/global_control.h>
-#include <tbb/task_arena.h>
-#include <valgrind/callgrind.h>
 
 #include <atomic>
-#include <chrono>
 #include <deque>
 #include <stdexcept>
 #include <vector>
 
-#include "GraphShapes.h"
+#include "MeasuredPart.h"
 
 namespace vantor::bench {
 
@@ -18,10 +16,8 @@ namespace {
 using Message = tbb::flow::continue_msg;
 using FlowNode = tbb::flow::continue_node<Message>;
 
-std::atomic<std::size_t> bodies{0};
-
 template <typename Body>
-double Run(const GraphShape& shape, const Body& body) {
+double RunWith(const GraphShape& shape, const Body& body) {
     tbb::flow::graph graph;
     std::deque<FlowNode> nodes;
     for (std::size_t i = 0; i < shape.count; ++i) {
@@ -32,39 +28,39 @@ double Run(const GraphShape& shape, const Body& body) {
         tbb::flow::make_edge(nodes[from], nodes[to]);
         waits[to] = true;
     }
-    CALLGRIND_START_INSTRUMENTATION;
-    const auto start = std::chrono::steady_clock::now();
-    for (std::size_t i = 0; i < shape.count; ++i) {
-        if (!waits[i]) {
-            nodes[i].try_put(Message());
+    return MeasuredSeconds([&] {
+        for (std::size_t i = 0; i < shape.count; ++i) {
+            if (!waits[i]) {
+                nodes[i].try_put(Message());
+            }
         }
-    }
-    graph.wait_for_all();
-    const std::chrono::duration<double, std::nano> taken = std::chrono::steady_clock::now() - start;
-    CALLGRIND_STOP_INSTRUMENTATION;
-    return taken.count();
+        graph.wait_for_all();
+    });
 }
 
 }  // namespace
 
-double RunFlowGraph(const GraphShape& shape, int workers, bool counted) {
-    const tbb::global_control limit(tbb::global_control::max_allowed_parallelism,
-                                    static_cast<std::size_t>(workers));
-    tbb::task_arena arena(workers);
-    return arena.execute([&] {
-        if (!counted) {
-            return Run(shape, [](const Message& message) { return message; });
-        }
-        bodies = 0;
-        const double taken = Run(shape, [](const Message& message) {
+FlowGraph::FlowGraph(int workers)
+    : limit(tbb::global_control::max_allowed_parallelism, static_cast<std::size_t>(workers)),
+      arena(workers) {}
+
+double FlowGraph::Run(const GraphShape& shape) {
+    return arena.execute(
+        [&] { return RunWith(shape, [](const Message& message) { return message; }); });
+}
+
+double FlowGraph::RunCounted(const GraphShape& shape) {
+    std::atomic<std::size_t> bodies{0};
+    const double taken = arena.execute([&] {
+        return RunWith(shape, [&bodies](const Message& message) {
             ++bodies;
             return message;
         });
-        if (bodies != shape.count) {
-            throw std::runtime_error("the flow graph did not run every node once");
-        }
-        return taken;
     });
+    if (bodies != shape.count) {
+        throw std::runtime_error("the flow graph did not run every node once");
+    }
+    return taken;
 }
 
 }  // namespace vantor::bench

@@ -1,30 +1,32 @@
-// What a graph of nodes that do nothing costs to run:
+// What a graph of nodes that do nothing costs to run, as benchmarks of Google Benchmark's. PROGRAM
+// is vantor, for its executor, or flow, for oneTBB's flow graph:
 //
-//     bench-graph boot vantor|flow SHAPE NODES WORKERS   vantor's executor, or oneTBB's flow graph
-//     bench-graph again vantor|flow SHAPE NODES WORKERS  the same again and again; the median
-//     bench-graph check vantor|flow SHAPE NODES WORKERS  once, and nodes count themselves
-//     bench-graph schedule near|far NODES                requesting a chain from one of its ends
-//     bench-graph height NODES                           of the first node of a chain
-//     bench-graph memory KIND NODES                      resident bytes; see MemoryBench.cc
+//     boot/PROGRAM/SHAPE/nodes:N/workers:W/...    one graph, in threads that have just begun
+//     again/PROGRAM/SHAPE/nodes:N/workers:W/...   many graphs, one after the other; the median
+//     check/PROGRAM/SHAPE/nodes:N/workers:W/...   one graph, whose nodes count themselves
+//     schedule/near/nodes:N/...                   requesting a chain from its first node,
+//     schedule/far/nodes:N/...                    or from its last one
+//     height/nodes:N/...                          of the first node of a chain
 //
-// Prints "nanoseconds <n>" for the part that is measured: the graph is built before it, and the
-// workers are started before it.
+// Each graph is built, and the workers are started, outside of the time that is measured. A boot is
+// only what its process does first and alone:
+//
+//     bench-graph --benchmark_filter=^boot/vantor/chain/nodes:1000/workers:1/
 
-#include <unistd.h>
-#include <valgrind/callgrind.h>
+#include <benchmark/benchmark.h>
 
-#include <algorithm>
 #include <atomic>
-#include <chrono>
+#include <cstdint>
 #include <cstdlib>
 #include <deque>
 #include <exception>
-#include <iostream>
 #include <stdexcept>
 #include <string>
 #include <vector>
 
+#include "FlowGraph.h"
 #include "GraphShapes.h"
+#include "MeasuredPart.h"
 #include "graph/Executor.h"
 #include "graph/Node.h"
 
@@ -55,108 +57,161 @@ std::deque<Kind> Build(const GraphShape& shape) {
     return nodes;
 }
 
-template <typename Work>
-double Nanoseconds(const Work& work) {
-    CALLGRIND_START_INSTRUMENTATION;  // nothing at all outside of callgrind
-    const auto start = std::chrono::steady_clock::now();
-    work();
-    const std::chrono::duration<double, std::nano> taken = std::chrono::steady_clock::now() - start;
-    CALLGRIND_STOP_INSTRUMENTATION;
-    return taken.count();
+// Vantor's side of the comparison; the other one is FlowGraph.
+class OwnGraph {
+public:
+    explicit OwnGraph(int workers) : executor(workers, false) {}
+
+    double Run(const GraphShape& shape) { return RunNodes<EmptyNode>(shape); }
+
+    double RunCounted(const GraphShape& shape) {
+        runs = 0;
+        const double taken = RunNodes<CountingNode>(shape);
+        if (runs != shape.count) {
+            throw std::runtime_error("the executor did not run every node once");
+        }
+        return taken;
+    }
+
+private:
+    // As the driver does it: every node is requested in order, and then waited for.
+    template <typename Kind>
+    double RunNodes(const GraphShape& shape) {
+        auto nodes = Build<Kind>(shape);
+        std::vector<Node*> sequence;
+        sequence.reserve(nodes.size());
+        for (Node& node : nodes) {
+            sequence.push_back(&node);
+        }
+        return MeasuredSeconds([&] { Node::RunAll(sequence, executor); });
+    }
+
+    Executor executor;
+};
+
+std::size_t NodeCount(const benchmark::State& state) {
+    return static_cast<std::size_t>(state.range(0));
 }
 
-[[noreturn]] void Report(double nanoseconds) {
-    std::cout << "nanoseconds " << std::fixed << nanoseconds << std::endl;
-    _exit(EXIT_SUCCESS);  // a million nodes take long to destroy, and nobody measures that
+int WorkerCount(const benchmark::State& state) { return static_cast<int>(state.range(1)); }
+
+template <typename Graph>
+void Boot(benchmark::State& state, const std::string& kind) {
+    const GraphShape shape = MakeShape(kind, NodeCount(state));
+    Graph graph(WorkerCount(state));
+    while (state.KeepRunning()) {
+        state.SetIterationTime(graph.Run(shape));
+    }
 }
 
-// As the driver does it: the executor is there first, then every node is requested in order.
-template <typename Kind>
-double RunVantor(const GraphShape& shape, Executor& executor) {
-    auto& nodes = *new std::deque<Kind>(Build<Kind>(shape));
-    std::vector<Node*> sequence;
-    sequence.reserve(nodes.size());
-    for (Node& node : nodes) {
-        sequence.push_back(&node);
+template <typename Graph>
+void Again(benchmark::State& state, const std::string& kind) {
+    const GraphShape shape = MakeShape(kind, NodeCount(state));
+    Graph graph(WorkerCount(state));
+    graph.Run(shape);  // caches and allocators are warm after this
+    while (state.KeepRunning()) {
+        state.SetIterationTime(graph.Run(shape));
     }
-    return Nanoseconds([&] { Node::RunAll(sequence, executor); });
 }
 
-// Once, as in a boot; or so often that caches are warm, each time with a graph of its own and all
-// with the same threads.
-void MeasureRuns(const std::vector<std::string>& words) {
-    constexpr std::size_t enough = 100000;
-    const GraphShape shape = MakeShape(words.at(2), std::stoul(words.at(3)));
-    const int workers = std::stoi(words.at(4));
-    const std::size_t runCount = words.at(0) == "boot" ? 1 : 1 + enough / shape.count;
-    std::vector<double> taken(runCount);
-    const bool isVantor = words.at(1) == "vantor";
-    Executor executor(isVantor ? workers : 0, false);
-    for (double& one : taken) {
-        one =
-            isVantor ? RunVantor<EmptyNode>(shape, executor) : RunFlowGraph(shape, workers, false);
+template <typename Graph>
+void Check(benchmark::State& state, const std::string& kind) {
+    const GraphShape shape = MakeShape(kind, NodeCount(state));
+    Graph graph(WorkerCount(state));
+    while (state.KeepRunning()) {
+        state.SetIterationTime(graph.RunCounted(shape));
     }
-    std::sort(taken.begin(), taken.end());
-    Report(taken[taken.size() / 2]);
 }
 
-void CheckRun(const std::vector<std::string>& words) {
-    const GraphShape shape = MakeShape(words.at(2), std::stoul(words.at(3)));
-    const int workers = std::stoi(words.at(4));
-    if (words.at(1) == "flow") {
-        Report(RunFlowGraph(shape, workers, true));
+void Require(bool holds, const char* otherwise) {
+    if (!holds) {
+        throw std::runtime_error(otherwise);
     }
-    Executor executor(workers, false);
-    const double taken = RunVantor<CountingNode>(shape, executor);
-    if (runs != shape.count) {
-        throw std::runtime_error("the executor did not run every node once");
-    }
-    Report(taken);
 }
 
 // Without workers, requesting is all that happens.
-void MeasureSchedule(const std::string& end, std::size_t count) {
-    auto& nodes = *new std::deque<EmptyNode>(Build<EmptyNode>(MakeShape("chain", count)));
+void ScheduleChain(benchmark::State& state, bool far) {
+    auto nodes = Build<EmptyNode>(MakeShape("chain", NodeCount(state)));
     Executor executor(0, false);
-    const double taken = Nanoseconds([&] {
-        if (end == "far") {
-            nodes.back().Schedule(executor);
-            return;
-        }
-        for (Node& node : nodes) {
-            node.Schedule(executor);
-        }
-    });
-    if (nodes.front().State() != NodeState::Queued || nodes.back().State() != NodeState::Waiting) {
-        throw std::runtime_error("the chain was not requested");
+    while (state.KeepRunning()) {
+        state.SetIterationTime(MeasuredSeconds([&] {
+            if (far) {
+                nodes.back().Schedule(executor);
+                return;
+            }
+            for (Node& node : nodes) {
+                node.Schedule(executor);
+            }
+        }));
     }
-    Report(taken);
+    Require(nodes.front().State() == NodeState::Queued, "the chain's first node is not queued");
+    Require(nodes.back().State() == NodeState::Waiting, "the chain's last node does not wait");
 }
 
-void MeasureHeight(std::size_t count) {
-    auto& nodes = *new std::deque<EmptyNode>(Build<EmptyNode>(MakeShape("chain", count)));
+void ChainHeight(benchmark::State& state) {
+    auto nodes = Build<EmptyNode>(MakeShape("chain", NodeCount(state)));
     std::int32_t height = 0;
-    const double taken = Nanoseconds([&] { height = nodes.front().Height(); });
-    if (static_cast<std::size_t>(height) != count) {
-        throw std::runtime_error("wrong height");
+    while (state.KeepRunning()) {
+        state.SetIterationTime(MeasuredSeconds([&] { height = nodes.front().Height(); }));
     }
-    Report(taken);
+    Require(static_cast<std::size_t>(height) == nodes.size(), "wrong height");
 }
 
-void Measure(const std::vector<std::string>& words) {
-    const std::string& mode = words.at(0);
-    if (mode == "boot" || mode == "again") {
-        MeasureRuns(words);
-    } else if (mode == "check") {
-        CheckRun(words);
-    } else if (mode == "schedule") {
-        MeasureSchedule(words.at(1), std::stoul(words.at(2)));
-    } else if (mode == "height") {
-        MeasureHeight(std::stoul(words.at(1)));
-    } else if (mode == "memory") {
-        PrintMemory(words.at(1), std::stoul(words.at(2)));
-    } else {
-        throw std::invalid_argument("no such mode: " + mode);
+constexpr std::int64_t smallest = 1000;
+constexpr std::int64_t largest = 1000000;
+constexpr int sizeStep = 10;
+
+// Each is one graph: what is short needs many for a median that does not jump.
+int Repetitions(std::int64_t count) { return count < 10000 ? 101 : 11; }
+
+// An error ends this benchmark only, and is reported with it.
+template <typename Measure, typename... Arguments>
+benchmark::internal::Benchmark* Register(const std::string& name, Measure* measure,
+                                         const Arguments&... arguments) {
+    const auto guarded = [=](benchmark::State& state) {
+        try {
+            measure(state, arguments...);
+        } catch (const std::exception& error) {
+            state.SkipWithError(error.what());
+        }
+    };
+    return benchmark::RegisterBenchmark(name.c_str(), guarded)->UseManualTime();
+}
+
+template <typename Graph>
+void RegisterRuns(const std::string& program, const std::string& kind) {
+    const std::string name = program + "/" + kind;
+    for (const int workers : {1, 8}) {
+        Register("check/" + name, &Check<Graph>, kind)
+            ->ArgNames({"nodes", "workers"})
+            ->Args({smallest, workers})
+            ->Iterations(1);
+        for (std::int64_t count = smallest; count <= largest; count *= sizeStep) {
+            Register("boot/" + name, &Boot<Graph>, kind)
+                ->ArgNames({"nodes", "workers"})
+                ->Args({count, workers})
+                ->Iterations(1);
+            Register("again/" + name, &Again<Graph>, kind)
+                ->ArgNames({"nodes", "workers"})
+                ->Args({count, workers})
+                ->Iterations(1)
+                ->Repetitions(Repetitions(count))
+                ->ReportAggregatesOnly();
+        }
+    }
+}
+
+void RegisterAll() {
+    for (const char* const kind : {"independent", "layered", "chain"}) {
+        RegisterRuns<OwnGraph>("vantor", kind);
+        RegisterRuns<FlowGraph>("flow", kind);
+    }
+    for (std::int64_t count = smallest; count <= largest; count *= sizeStep) {
+        for (auto* const chain :
+             {Register("schedule/near", &ScheduleChain, false),
+              Register("schedule/far", &ScheduleChain, true), Register("height", &ChainHeight)}) {
+            chain->ArgName("nodes")->Arg(count)->Iterations(1);
+        }
     }
 }
 
@@ -165,11 +220,10 @@ void Measure(const std::vector<std::string>& words) {
 }  // namespace vantor::bench
 
 int main(int argc, char** argv) {
-    try {
-        vantor::bench::Measure({argv + 1, argv + argc});
-    } catch (const std::exception& error) {
-        std::cerr << "bench-graph: " << error.what() << std::endl;
-        _exit(EXIT_FAILURE);
+    benchmark::Initialize(&argc, argv);
+    if (benchmark::ReportUnrecognizedArguments(argc, argv)) {
+        return EXIT_FAILURE;
     }
-    _exit(EXIT_SUCCESS);
+    vantor::bench::RegisterAll();
+    return benchmark::RunSpecifiedBenchmarks() != 0 ? EXIT_SUCCESS : EXIT_FAILURE;
 }

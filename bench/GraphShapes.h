@@ -20,14 +20,6 @@ struct GraphShape {
 // Throws std::invalid_argument for any other kind.
 GraphShape MakeShape(const std::string& kind, std::size_t count);
 
-// Runs the shape with empty bodies on a flow graph of oneTBB and returns the nanoseconds from the
-// first message to the end of the last body. With `counted`, bodies count themselves: every node
-// must have run once, or std::runtime_error is thrown.
-double RunFlowGraph(const GraphShape& shape, int workers, bool counted);
-
-// Prints what nodes cost in memory, a line for each kind; see MemoryBench.cc.
-void PrintMemory(const std::string& kind, std::size_t count);
-
 }  // namespace vantor::bench
 
 #endif

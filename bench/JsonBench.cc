@@ -1,23 +1,24 @@
-// What reading JSON files costs: bench-json reader|dom REPEATS FILE...
+// What reading JSON files costs, as one benchmark of Google Benchmark's:
+//
+//     bench-json reader|dom ITERATIONS FILE...
 //
 // "reader" is vantor's own reader, "dom" is nlohmann-json's, each on a std::ifstream of its own for
-// every file. Prints the bytes and nanoseconds of all repeats together; then, so that both can be
-// seen to have read the same, how many values the files hold, the bytes of their texts and the sum
-// of their numbers.
+// every file. An iteration reads all files. Counters tell their bytes and, so that both can be seen
+// to have read the same, how many values they hold, the bytes of their texts and the sum of their
+// numbers.
 
-#include <valgrind/callgrind.h>
+#include <benchmark/benchmark.h>
 
-#include <chrono>
 #include <cstdlib>
 #include <exception>
 #include <fstream>
-#include <iomanip>
 #include <iostream>
 #include <nlohmann/json.hpp>
 #include <stdexcept>
 #include <string>
 #include <vector>
 
+#include "MeasuredPart.h"
 #include "json/JsonReader.h"
 
 namespace vantor::bench {
@@ -90,25 +91,39 @@ nlohmann::json ReadDom(const std::string& path) {
 }
 
 template <typename Read>
-void Measure(const Read& read, int repeats, const std::vector<std::string>& paths) {
+void Measure(benchmark::State& state, const Read& read, const std::vector<std::string>& paths) {
     std::size_t bytes = 0;
     Content content;
     for (const std::string& path : paths) {  // the caches are warm after this
         bytes += static_cast<std::size_t>(Open(path).seekg(0, std::ios::end).tellg());
         Count(read(path), content);
     }
-    CALLGRIND_START_INSTRUMENTATION;
-    const auto start = std::chrono::steady_clock::now();
-    for (int i = 0; i < repeats; ++i) {
-        for (const std::string& path : paths) {
-            read(path);
-        }
+    while (state.KeepRunning()) {
+        state.SetIterationTime(MeasuredSeconds([&] {
+            for (const std::string& path : paths) {
+                benchmark::DoNotOptimize(read(path));
+            }
+        }));
     }
-    const std::chrono::duration<double, std::nano> taken = std::chrono::steady_clock::now() - start;
-    CALLGRIND_STOP_INSTRUMENTATION;
-    std::cout << std::fixed << "bytes " << bytes * static_cast<std::size_t>(repeats)
-              << "\nnanoseconds " << taken.count() << "\nvalues " << content.values << "\ntext "
-              << content.textBytes << "\nsum " << content.sum << std::endl;
+    state.counters["bytes"] = static_cast<double>(bytes);
+    state.counters["values"] = static_cast<double>(content.values);
+    state.counters["text"] = static_cast<double>(content.textBytes);
+    state.counters["sum"] = content.sum;
+}
+
+void MeasureReader(benchmark::State& state, const std::string& name,
+                   const std::vector<std::string>& paths) {
+    try {
+        if (name == "reader") {
+            Measure(state, ReadOwn, paths);
+        } else if (name == "dom") {
+            Measure(state, ReadDom, paths);
+        } else {
+            throw std::invalid_argument("no such reader: " + name);
+        }
+    } catch (const std::exception& error) {
+        state.SkipWithError(error.what());
+    }
 }
 
 }  // namespace
@@ -117,15 +132,15 @@ void Measure(const Read& read, int repeats, const std::vector<std::string>& path
 
 int main(int argc, char** argv) {
     using namespace vantor::bench;
+    benchmark::Initialize(&argc, argv);
     try {
         const std::vector<std::string> words(argv + 1, argv + argc);
-        const int repeats = std::stoi(words.at(1));
+        const int iterations = std::stoi(words.at(1));
         const std::vector<std::string> paths(words.begin() + 2, words.end());
-        if (words[0] == "reader") {
-            Measure(ReadOwn, repeats, paths);
-        } else {
-            Measure(ReadDom, repeats, paths);
-        }
+        benchmark::RegisterBenchmark(words[0].c_str(), MeasureReader, words[0], paths)
+            ->Iterations(iterations)
+            ->UseManualTime();
+        benchmark::RunSpecifiedBenchmarks();
     } catch (const std::exception& error) {
         std::cerr << "bench-json: " << error.what() << std::endl;
         return EXIT_FAILURE;

@@ -1,21 +1,25 @@
-// The kinds that PrintMemory() knows:
+// What nodes cost in memory:
 //
-//     plugin    debug plugins that stand alone
-//     barrier   barriers that nobody provides or requires
-//     graph     half plugins, half barriers: each plugin provides one barrier and requires another
+//     bench-memory plugin NODES    debug plugins that stand alone
+//     bench-memory barrier NODES   barriers that nobody provides or requires
+//     bench-memory graph NODES     half plugins, half barriers: each plugin provides one barrier
+//     and
+//                                  requires another
 //
-// It prints "resident", the bytes by which the process grew, and "own", the sum of the objects'
+// Prints "resident", the bytes by which the process grew, and "own", the sum of the objects'
 // sizes and their names' bytes.
 
 #include <unistd.h>
 
+#include <cstdlib>
+#include <exception>
 #include <fstream>
 #include <iostream>
 #include <list>
 #include <stdexcept>
 #include <string>
+#include <vector>
 
-#include "GraphShapes.h"
 #include "graph/InitBarrier.h"
 #include "graph/KeepUntilExit.h"
 #include "plugins/DebugPlugin.h"
@@ -74,12 +78,23 @@ std::size_t MakeNodes(const std::string& kind, std::size_t count) {
     return own;
 }
 
-}  // namespace
-
 void PrintMemory(const std::string& kind, std::size_t count) {
     const std::size_t before = ResidentBytes();
     const std::size_t own = MakeNodes(kind, count);
     std::cout << "resident " << ResidentBytes() - before << "\nown " << own << std::endl;
 }
 
+}  // namespace
+
 }  // namespace vantor::bench
+
+int main(int argc, char** argv) {
+    try {
+        const std::vector<std::string> words(argv + 1, argv + argc);
+        vantor::bench::PrintMemory(words.at(0), std::stoul(words.at(1)));
+    } catch (const std::exception& error) {
+        std::cerr << "bench-memory: " << error.what() << std::endl;
+        return EXIT_FAILURE;
+    }
+    return EXIT_SUCCESS;
+}

@@ -10,9 +10,10 @@ sys.path[:0] = [HERE, os.path.join(HERE, "..", "tests", "system")]
 
 # pylint: disable=wrong-import-position
 from suite.command_graphs import CommandGraph  # noqa: E402
+from suite.host import one_benchmark  # noqa: E402
 from suite.makespan import random_plugins  # noqa: E402
 from suite.plot import svg  # noqa: E402
-from suite.results import Curve, Results, Row  # noqa: E402
+from suite.results import BenchError, Curve, Results, Row  # noqa: E402
 from suite.simulation import SleepingPlugin, lower_bound, makespan  # noqa: E402
 
 
@@ -122,6 +123,28 @@ def test_figures_that_belong_together_are_averaged_place_by_place():
     runs = iter([(1, 10), (3, 30)])
     results = Results(rounds=1, quick=True)
     assert results.alternate("pairs", {"a": lambda: next(runs)}, often={"a": 2}) == {"a": [(2, 20)]}
+
+
+def test_of_a_repeated_benchmark_the_median_counts():
+    report = {"benchmarks": [
+        {"name": f"work_{kind}", "aggregate_name": kind, "real_time": time, "time_unit": "ns"}
+        for kind, time in (("mean", 5.0), ("median", 4.0), ("stddev", 1.0))]}
+    assert one_benchmark(report, "work")["real_time"] == 4.0
+
+
+def test_a_benchmark_that_failed_has_no_figure():
+    report = {"benchmarks": [{"name": "work", "error_occurred": True, "real_time": 0.0,
+                              "error_message": "not every node ran", "time_unit": "ns"}]}
+    with pytest.raises(BenchError, match="^work: not every node ran$"):
+        one_benchmark(report, "work")
+
+
+@pytest.mark.parametrize("entries", [
+    [], [{"name": "one", "time_unit": "ns"}, {"name": "two", "time_unit": "ns"}],
+    [{"name": "one", "time_unit": "ms"}]])
+def test_a_report_of_anything_but_one_benchmark_in_nanoseconds_is_refused(entries):
+    with pytest.raises(BenchError, match="not one benchmark in nanoseconds"):
+        one_benchmark({"benchmarks": entries}, "work")
 
 
 def test_a_drawing_holds_every_point():

@@ -16,17 +16,19 @@ def _limit(shape, workers):
     return 1.5 if workers == 1 else 3.0
 
 
-def _per_node(host, *arguments):
-    """The last argument but the workers is the number of nodes."""
-    count = next(word for word in reversed(arguments) if isinstance(word, int) and word > 8)
-    return host.run_own("bench-graph", *arguments)["nanoseconds"] / count
+def only(name, count, workers=None):
+    """The option by which bench-graph runs one of its benchmarks."""
+    return f"--benchmark_filter=^{name}/nodes:{count}/" + (f"workers:{workers}/" if workers else "")
+
+
+def _per_node(host, name, count, workers=None):
+    return host.run_benchmark("bench-graph", only(name, count, workers))["real_time"] / count
 
 
 def _first_run(host, program, shape, count, workers):
-    """The first run of a process. One of a small graph is short and is seen in several processes.
-    """
-    processes = 9 if count <= SMALL else 1
-    return statistics.median(_per_node(host, "boot", program, shape, count, workers)
+    """The first run of a process. One of a small graph is short and is seen in many processes."""
+    processes = {1000: 27, 10000: 9}.get(count, 1)
+    return statistics.median(_per_node(host, f"boot/{program}/{shape}", count, workers)
                              for _ in range(processes))
 
 
@@ -34,7 +36,7 @@ def _check(host, count):
     for shape in SHAPES:
         for program in PROGRAMS:
             for workers in (1, 8):
-                host.run_own("bench-graph", "check", program, shape, count, workers)
+                _per_node(host, f"check/{program}/{shape}", count, workers)
 
 
 def _beside_one(results, count, what, eight, one):
@@ -47,7 +49,7 @@ def _measure_shape(host, results, shape, counts):
             for count in counts for workers in (1, 8) for program in PROGRAMS]
     figures = results.alternate(f"{GROUP}: {shape}", {
         key: lambda key=key: _first_run(host, key[0], shape, key[2], key[1]) for key in keys})
-    _compare(results, shape, counts, figures, "")
+    _compare(results, shape, counts, figures, "", _limit)
     small, large = counts[-1] // 100 if counts[-1] // 100 in counts else counts[0], counts[-1]
     for workers in (1, 8):
         results.compare(GROUP, f"{shape}, {_workers(workers)}, from {small:,} to {large:,} nodes",
@@ -64,17 +66,18 @@ def _measure_again(host, results, shape, counts):
     keys = [(program, workers, count)
             for count in counts for workers in (1, 8) for program in PROGRAMS]
     figures = results.alternate(f"{GROUP}: {shape}, again", {
-        key: lambda key=key: _per_node(host, "again", key[0], shape, key[2], key[1])
+        key: lambda key=key: _per_node(host, f"again/{key[0]}/{shape}", key[2], key[1])
         for key in keys})
-    _compare(results, shape, counts, figures, ", again and again")
+    # Without limits: those are for what a boot is, a graph that its process runs once.
+    _compare(results, shape, counts, figures, ", again and again", lambda shape, workers: None)
 
 
-def _compare(results, shape, counts, figures, what):
+def _compare(results, shape, counts, figures, what, limit):
     for count in counts:
         for workers in (1, 8):
             results.compare(GROUP, f"{count:,} nodes, {shape}, {_workers(workers)}{what}",
                             "ns/node", ("vantor", figures["vantor", workers, count]),
-                            ("oneTBB", figures["flow", workers, count]), _limit(shape, workers))
+                            ("oneTBB", figures["flow", workers, count]), limit(shape, workers))
         if shape == "chain":
             _beside_one(results, count, what, figures["vantor", 8, count],
                         figures["vantor", 1, count])
@@ -86,8 +89,8 @@ def _workers(count):
 
 def _measure_long_chain(host, results, count):
     figures = results.alternate(f"{GROUP}: chain of {count:,}", {
-        "requested from its first node": lambda: _per_node(host, "schedule", "near", count),
-        "requested from its last node": lambda: _per_node(host, "schedule", "far", count),
+        "requested from its first node": lambda: _per_node(host, "schedule/near", count),
+        "requested from its last node": lambda: _per_node(host, "schedule/far", count),
         "height of its first node": lambda: _per_node(host, "height", count),
     })
     for what, values in figures.items():
@@ -112,7 +115,7 @@ def measure_memory(host, results):
         grown, own = [], []
         for number in range(results.rounds):
             results.progress.say(f"memory: {label}, round {number + 1} of {results.rounds}")
-            figures = host.run_own("bench-graph", "memory", kind, count)
+            figures = host.run_own("bench-memory", kind, count)
             grown.append(figures["resident"] / count)
             own.append(figures["own"] / count)
         results.compare("memory", f"{count:,} {label}", "bytes/node", ("resident", grown),

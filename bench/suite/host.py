@@ -1,5 +1,6 @@
 """The private root in which whole processes are measured, each in the same surroundings."""
 
+import json
 import os
 import shutil
 import statistics
@@ -130,8 +131,18 @@ class Host:
     def forget_last_boot(self):
         self.root.remove(PROFILING_LOG)
 
-    def run_own(self, program, *arguments, limit=300):
+    def run_own(self, program, *arguments):
         """Runs one of the measuring programs outside the root; its lines "name value" as a dict."""
+        return {name: float(value) for name, value in
+                (line.split() for line in self._output_of(program, *arguments).splitlines())}
+
+    def run_benchmark(self, program, *arguments):
+        """Runs one of our programs with Google Benchmark outside the root; what it reports of its
+        one benchmark, with the times in nanoseconds."""
+        report = json.loads(self._output_of(program, "--benchmark_format=json", *arguments))
+        return one_benchmark(report, " ".join(map(str, (program, *arguments)))[:80])
+
+    def _output_of(self, program, *arguments, limit=300):
         command = [self.program(program), *map(str, arguments)]
         try:
             done = subprocess.run(command, capture_output=True, text=True, check=False,
@@ -142,8 +153,23 @@ class Host:
         if done.returncode != 0:
             raise BenchError(f"{program} {' '.join(map(str, arguments))[:80]}: "
                              f"status {done.returncode} {done.stderr.strip()}")
-        return {name: float(value) for name, value in
-                (line.split() for line in done.stdout.splitlines())}
+        return done.stdout
+
+
+def one_benchmark(report, what):
+    """The entry of the only benchmark in a report of Google Benchmark's.
+
+    Where it was repeated, the entry is that of the median.
+    """
+    for entry in report["benchmarks"]:
+        if entry.get("error_occurred"):
+            raise BenchError(f"{what}: {entry['error_message']}")
+    found = [entry for entry in report["benchmarks"]
+             if entry.get("aggregate_name", "median") == "median"]
+    if len(found) != 1 or found[0]["time_unit"] != "ns":
+        raise BenchError(f"{what}: not one benchmark in nanoseconds, but "
+                         f"{[entry['name'] for entry in found]}")
+    return found[0]
 
 
 def _microseconds(text):

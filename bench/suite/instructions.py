@@ -8,6 +8,7 @@ import subprocess
 
 from harness.private_root import PLUGINS
 
+from suite.graph import only
 from suite.host import VANTOR
 from suite.loading import lay_out_plugins, write_documents
 from suite.results import BenchError
@@ -33,6 +34,10 @@ def _count_part(host, program, *arguments):
     return _collected(done.stderr)
 
 
+def _count_graph(host, name, count, workers=None):
+    return _count_part(host, "bench-graph", only(name, count, workers)) / count
+
+
 def _count_whole(host, *command):
     """Instructions of a whole run in the private root, its children not included."""
     return _collected(host.errors_of("/usr/bin/valgrind", "--vgdb=no", *_VALGRIND, *command))
@@ -41,22 +46,22 @@ def _count_whole(host, *command):
 def _graph(host, results, count):
     for shape in ("independent", "layered", "chain"):
         results.progress.say(f"{GROUP}: {shape} graph")
-        ours, theirs = ([_count_part(host, "bench-graph", "boot", program, shape, count, 1) / count]
+        ours, theirs = ([_count_graph(host, f"boot/{program}/{shape}", count, 1)]
                         for program in ("vantor", "flow"))
         results.compare(GROUP, f"{count:,} empty nodes, {shape}, 1 worker", "per node",
                         ("vantor", ours), ("oneTBB", theirs))
-    for what, arguments in (("requested from its first node", ("schedule", "near", count)),
-                            ("requested from its last node", ("schedule", "far", count)),
-                            ("height of its first node", ("height", count))):
+    for what, name in (("requested from its first node", "schedule/near"),
+                       ("requested from its last node", "schedule/far"),
+                       ("height of its first node", "height")):
         results.figure(GROUP, f"chain of {count:,} nodes, {what}", "vantor",
-                       [_count_part(host, "bench-graph", *arguments) / count], "per node")
+                       [_count_graph(host, name, count)], "per node")
 
 
 def _json(host, results, folder):
     small, large = write_documents(folder, 100, 200000)
     for label, paths in (("100 documents of 0.5 to 4 KB", small), ("a document of 0.2 MB", large)):
         results.progress.say(f"{GROUP}: {label}")
-        size = host.run_own("bench-json", "reader", 1, *paths)["bytes"]
+        size = host.run_benchmark("bench-json", "reader", 1, *paths)["bytes"]
         ours, theirs = ([_count_part(host, "bench-json", reader, 1, *paths) / size]
                         for reader in ("reader", "dom"))
         results.compare(GROUP, f"{label}, read from files", "per byte", ("vantor's reader", ours),

@@ -110,12 +110,12 @@ def write_documents(folder, count, large):
 
 
 def _read(host, reader, repeats, paths, contents):
-    figures = host.run_own("bench-json", reader, repeats, *paths)
+    figures = host.run_benchmark("bench-json", reader, repeats, *paths)
     contents.append((figures["values"], figures["text"], round(figures["sum"], 3)))
     if contents[-1] != contents[0]:
         raise BenchError(f"the two JSON readers read different things: {contents[0]} and "
                          f"{contents[-1]}")
-    return figures["nanoseconds"] / figures["bytes"]
+    return figures["real_time"] / figures["bytes"]
 
 
 def measure_json(host, results, folder):
