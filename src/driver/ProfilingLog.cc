@@ -3,9 +3,12 @@
 #include <syslog.h>
 
 #include <algorithm>
+#include <array>
 #include <cerrno>
+#include <charconv>
 #include <cstring>
 #include <ctime>
+#include <limits>
 #include <stdexcept>
 #include <string>
 
@@ -18,10 +21,11 @@ namespace {
 constexpr const char* profilingLog = "/var/log/sysboot.log";
 
 // Many times faster than a stream that is told about widths; two times are written for each plugin.
-std::string Padded(std::int64_t value, std::size_t width) {
-    std::string digits = std::to_string(value);
-    digits.insert(0, std::max(width, digits.size()) - digits.size(), '0');
-    return digits;
+void AppendPadded(std::string& text, std::int64_t value, std::size_t width) {
+    std::array<char, std::numeric_limits<std::int64_t>::digits10 + 2> digits;  // one more; a sign
+    const auto written = std::to_chars(digits.data(), digits.data() + digits.size(), value);
+    const auto count = static_cast<std::size_t>(written.ptr - digits.data());
+    text.append(std::max(width, count) - count, '0').append(digits.data(), count);
 }
 
 }  // namespace
@@ -30,11 +34,14 @@ std::ostream& FormatTime(std::ostream& stream, const timeval& time) {
     std::tm utc{};
     const std::time_t seconds = time.tv_sec;
     gmtime_r(&seconds, &utc);
-    std::string text = Padded(utc.tm_year + std::int64_t{1900}, 4);
-    text += '-' + Padded(utc.tm_mon + 1, 2) + '-' + Padded(utc.tm_mday, 2);
-    text +=
-        ' ' + Padded(utc.tm_hour, 2) + ':' + Padded(utc.tm_min, 2) + ':' + Padded(utc.tm_sec, 2);
-    text += '.' + Padded(time.tv_usec, 6);
+    std::string text;
+    AppendPadded(text, utc.tm_year + std::int64_t{1900}, 4);
+    AppendPadded(text += '-', utc.tm_mon + 1, 2);
+    AppendPadded(text += '-', utc.tm_mday, 2);
+    AppendPadded(text += ' ', utc.tm_hour, 2);
+    AppendPadded(text += ':', utc.tm_min, 2);
+    AppendPadded(text += ':', utc.tm_sec, 2);
+    AppendPadded(text += '.', time.tv_usec, 6);
     stream.fill('0');
     stream.width(0);
     return stream << text;
