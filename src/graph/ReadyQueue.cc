@@ -18,7 +18,7 @@ void ReadyQueue::Push(Node& node) {
         highestHeight = highest.first->HeightLocked();
     }
     const std::int32_t height = node.HeightLocked();
-    Append(height == highestHeight ? highest : OtherRow(height), node);
+    Append(height == highestHeight ? highest : RowOfOtherHeight(height), node);
 }
 
 Node& ReadyQueue::TakeHighest(std::size_t position) {
@@ -41,7 +41,7 @@ Node& ReadyQueue::TakeHighest(std::size_t position) {
     return *taken;
 }
 
-ReadyQueue::Row& ReadyQueue::OtherRow(std::int32_t height) {
+ReadyQueue::Row& ReadyQueue::RowOfOtherHeight(std::int32_t height) {
     if (height > highestHeight) {
         MakeRow(lower.cbegin(), highestHeight) = std::exchange(highest, Row());
         highestHeight = height;

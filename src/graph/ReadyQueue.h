@@ -39,7 +39,8 @@ private:
     };
     using Rows = std::map<std::int32_t, Row, std::greater<>>;
 
-    Row& OtherRow(std::int32_t height);  // than the highest there is; made if there is none
+    // The row of another height than the highest one's; a greater one becomes the highest.
+    Row& RowOfOtherHeight(std::int32_t height);
     Row& MakeRow(Rows::const_iterator before, std::int32_t height);
     static void Append(Row& row, Node& node);
 

@@ -92,7 +92,11 @@ protected:
         }
     }
 
-    NodesOfHeights nodes{9};
+    // Pushes and takes nodes of heights from 1 to the greatest, all at random, and expects each
+    // choice to be that of a plain scan, with a draw among the highest.
+    void CompareWithPlainScan(std::size_t nodeCount, int greatestHeight, int stepCount);
+
+    NodesOfHeights nodes{100};
     ReadyQueue queue;
     const GlobalLockGuard guard;
 };
@@ -193,18 +197,16 @@ TEST_F(ReadyQueueTest, NodeThatWasAloneIsComparedWithTheNext) {
     EXPECT_EQ(&queue.TakeHighest(0), &low);
 }
 
-// The choice of a plain scan, and of a draw among the highest, at every one of a million steps.
-TEST_F(ReadyQueueTest, AMillionRandomStepsChooseAsAPlainScanDoes) {
-    const int greatestHeight = 5;
-    const std::size_t nodeCount = 24;
+void ReadyQueueTest::CompareWithPlainScan(std::size_t nodeCount, int greatestHeight,
+                                          int stepCount) {
     std::mt19937 random(20261122);
     std::vector<Node*> idle;
     for (std::size_t index = 0; index < nodeCount; ++index) {
-        idle.push_back(&nodes.OfHeight(1 + static_cast<int>(random() % greatestHeight)));
+        const auto heights = static_cast<unsigned>(greatestHeight);
+        idle.push_back(&nodes.OfHeight(1 + static_cast<int>(random() % heights)));
     }
     PlainScan model;
     std::size_t choices = 0;
-    const int stepCount = support::underSanitizers ? 100000 : 1000000;
     for (int step = 0; step < stepCount; ++step) {
         const bool push = model.Empty() || (!idle.empty() && random() % 2 == 0);
         if (push) {
@@ -225,6 +227,14 @@ TEST_F(ReadyQueueTest, AMillionRandomStepsChooseAsAPlainScanDoes) {
         ++choices;
     }
     EXPECT_GT(choices, static_cast<std::size_t>(stepCount) * 2 / 5);
+}
+
+TEST_F(ReadyQueueTest, AMillionRandomStepsChooseAsAPlainScanDoes) {
+    CompareWithPlainScan(24, 5, support::underSanitizers ? 100000 : 1000000);
+}
+
+TEST_F(ReadyQueueTest, ManyRowsChooseAsAPlainScanDoes) {
+    CompareWithPlainScan(400, 100, support::underSanitizers ? 5000 : 50000);
 }
 
 }  // namespace
