@@ -1,10 +1,13 @@
 #include "FlowGraph.h"
 
 #include <tbb/flow_graph.h>
+#include <tbb/task_group.h>
 
 #include <atomic>
+#include <chrono>
 #include <deque>
 #include <stdexcept>
+#include <thread>
 #include <vector>
 
 #include "MeasuredPart.h"
@@ -28,21 +31,48 @@ double RunWith(const GraphShape& shape, const Body& body) {
         tbb::flow::make_edge(nodes[from], nodes[to]);
         waits[to] = true;
     }
+    std::vector<FlowNode*> first;
+    for (std::size_t i = 0; i < shape.count; ++i) {
+        if (!waits[i]) {
+            first.push_back(&nodes[i]);
+        }
+    }
     return MeasuredSeconds([&] {
-        for (std::size_t i = 0; i < shape.count; ++i) {
-            if (!waits[i]) {
-                nodes[i].try_put(Message());
-            }
+        for (FlowNode* node : first) {
+            node->try_put(Message());
         }
         graph.wait_for_all();
     });
+}
+
+// oneTBB starts a thread when there is first something for it to do: here, to wait for the others.
+void StartThreads(tbb::task_arena& arena, int workers) {
+    using Clock = std::chrono::steady_clock;
+    const auto end = Clock::now() + std::chrono::seconds(10);
+    std::atomic<int> present{0};
+    arena.execute([&] {
+        tbb::task_group threads;
+        for (int i = 0; i < workers; ++i) {
+            threads.run([&] {
+                for (++present; present < workers && Clock::now() < end;) {
+                    std::this_thread::yield();
+                }
+            });
+        }
+        threads.wait();
+    });
+    if (Clock::now() >= end) {
+        throw std::runtime_error("oneTBB did not start all its threads");
+    }
 }
 
 }  // namespace
 
 FlowGraph::FlowGraph(int workers)
     : limit(tbb::global_control::max_allowed_parallelism, static_cast<std::size_t>(workers)),
-      arena(workers) {}
+      arena(workers) {
+    StartThreads(arena, workers);
+}
 
 double FlowGraph::Run(const GraphShape& shape) {
     return arena.execute(

@@ -8,11 +8,13 @@
 
 namespace vantor::bench {
 
-// Runs shapes on flow graphs of oneTBB, beside which vantor's executor stands. The threads stay
-// from run to run. Only one object at a time.
+// Runs shapes on flow graphs of oneTBB, beside which vantor's executor stands. The threads are
+// there from the beginning, as the executor's are, and stay from run to run. Only one object at a
+// time.
 class FlowGraph {
 public:
     // The thread that calls Run() is one of the `workers`, so that one worker is that thread alone.
+    // Throws std::runtime_error when oneTBB does not start the others.
     explicit FlowGraph(int workers);
 
     // Runs a new graph of the shape, with empty bodies, and returns the seconds from the first

@@ -1,7 +1,7 @@
 // What a graph of nodes that do nothing costs to run, as benchmarks of Google Benchmark's. PROGRAM
 // is vantor, for its executor, or flow, for oneTBB's flow graph:
 //
-//     boot/PROGRAM/SHAPE/nodes:N/workers:W/...    one graph, in threads that have just begun
+//     boot/PROGRAM/SHAPE/nodes:N/workers:W/...    one graph, by threads that have just begun
 //     again/PROGRAM/SHAPE/nodes:N/workers:W/...   many graphs, one after the other; the median
 //     check/PROGRAM/SHAPE/nodes:N/workers:W/...   one graph, whose nodes count themselves
 //     schedule/near/nodes:N/...                   requesting a chain from its first node,
@@ -15,17 +15,18 @@
 
 #include <benchmark/benchmark.h>
 
+#include <algorithm>
 #include <atomic>
 #include <cstdint>
 #include <cstdlib>
 #include <deque>
-#include <exception>
 #include <stdexcept>
 #include <string>
 #include <vector>
 
 #include "FlowGraph.h"
 #include "GraphShapes.h"
+#include "GuardedBenchmarks.h"
 #include "MeasuredPart.h"
 #include "graph/Executor.h"
 #include "graph/Node.h"
@@ -162,18 +163,16 @@ constexpr std::int64_t largest = 1000000;
 constexpr int sizeStep = 10;
 
 // Each is one graph: what is short needs many for a median that does not jump.
-int Repetitions(std::int64_t count) { return count < 10000 ? 101 : 11; }
+int Repetitions(std::int64_t count) {
+    constexpr std::int64_t nodes = 100000;
+    constexpr std::int64_t fewest = 3;
+    return static_cast<int>(std::max(fewest, nodes / count)) | 1;  // odd: a median of what was seen
+}
 
-// An error ends this benchmark only, and is reported with it.
 template <typename Measure, typename... Arguments>
-benchmark::internal::Benchmark* Register(const std::string& name, Measure* measure,
-                                         const Arguments&... arguments) {
+auto* Register(const std::string& name, Measure* measure, const Arguments&... arguments) {
     const auto guarded = [=](benchmark::State& state) {
-        try {
-            measure(state, arguments...);
-        } catch (const std::exception& error) {
-            state.SkipWithError(error.what());
-        }
+        Guarded(state, [&] { measure(state, arguments...); });
     };
     return benchmark::RegisterBenchmark(name.c_str(), guarded)->UseManualTime();
 }
@@ -220,10 +219,11 @@ void RegisterAll() {
 }  // namespace vantor::bench
 
 int main(int argc, char** argv) {
+    using namespace vantor::bench;
     benchmark::Initialize(&argc, argv);
     if (benchmark::ReportUnrecognizedArguments(argc, argv)) {
         return EXIT_FAILURE;
     }
-    vantor::bench::RegisterAll();
-    return benchmark::RunSpecifiedBenchmarks() != 0 ? EXIT_SUCCESS : EXIT_FAILURE;
+    RegisterAll();
+    return RunBenchmarks();
 }

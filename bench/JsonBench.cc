@@ -18,6 +18,7 @@
 #include <string>
 #include <vector>
 
+#include "GuardedBenchmarks.h"
 #include "MeasuredPart.h"
 #include "json/JsonReader.h"
 
@@ -113,7 +114,7 @@ void Measure(benchmark::State& state, const Read& read, const std::vector<std::s
 
 void MeasureReader(benchmark::State& state, const std::string& name,
                    const std::vector<std::string>& paths) {
-    try {
+    Guarded(state, [&] {
         if (name == "reader") {
             Measure(state, ReadOwn, paths);
         } else if (name == "dom") {
@@ -121,9 +122,7 @@ void MeasureReader(benchmark::State& state, const std::string& name,
         } else {
             throw std::invalid_argument("no such reader: " + name);
         }
-    } catch (const std::exception& error) {
-        state.SkipWithError(error.what());
-    }
+    });
 }
 
 }  // namespace
@@ -140,10 +139,9 @@ int main(int argc, char** argv) {
         benchmark::RegisterBenchmark(words[0].c_str(), MeasureReader, words[0], paths)
             ->Iterations(iterations)
             ->UseManualTime();
-        benchmark::RunSpecifiedBenchmarks();
+        return RunBenchmarks();
     } catch (const std::exception& error) {
         std::cerr << "bench-json: " << error.what() << std::endl;
         return EXIT_FAILURE;
     }
-    return EXIT_SUCCESS;
 }

@@ -1,10 +1,8 @@
-// What nodes cost in memory:
+// What nodes cost in memory: bench-memory KIND NODES
 //
-//     bench-memory plugin NODES    debug plugins that stand alone
-//     bench-memory barrier NODES   barriers that nobody provides or requires
-//     bench-memory graph NODES     half plugins, half barriers: each plugin provides one barrier
-//     and
-//                                  requires another
+//     plugin    debug plugins that stand alone
+//     barrier   barriers that nobody provides or requires
+//     graph     half plugins, half barriers: each plugin provides one barrier and requires another
 //
 // Prints "resident", the bytes by which the process grew, and "own", the sum of the objects'
 // sizes and their names' bytes.

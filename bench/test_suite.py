@@ -1,6 +1,7 @@
 """Tests of what the figures rest on: python3 -B -m pytest -p no:cacheprovider bench"""
 
 import os
+import re
 import sys
 
 import pytest
@@ -9,10 +10,13 @@ HERE = os.path.dirname(os.path.abspath(__file__))
 sys.path[:0] = [HERE, os.path.join(HERE, "..", "tests", "system")]
 
 # pylint: disable=wrong-import-position
+from suite import graph  # noqa: E402
 from suite.command_graphs import CommandGraph  # noqa: E402
 from suite.host import one_benchmark  # noqa: E402
+from suite.instructions import collected  # noqa: E402
 from suite.makespan import random_plugins  # noqa: E402
 from suite.plot import svg  # noqa: E402
+from suite.report import summary  # noqa: E402
 from suite.results import BenchError, Curve, Results, Row  # noqa: E402
 from suite.simulation import SleepingPlugin, lower_bound, makespan  # noqa: E402
 
@@ -145,6 +149,34 @@ def test_a_benchmark_that_failed_has_no_figure():
 def test_a_report_of_anything_but_one_benchmark_in_nanoseconds_is_refused(entries):
     with pytest.raises(BenchError, match="not one benchmark in nanoseconds"):
         one_benchmark({"benchmarks": entries}, "work")
+
+
+@pytest.mark.parametrize("name, chosen", [
+    ("boot/vantor/chain/nodes:1000/workers:1/iterations:1/manual_time", True),
+    ("boot/vantor/chain/nodes:10000/workers:1/iterations:1/manual_time", False),
+    ("boot/vantor/chain/nodes:1000/workers:16/iterations:1/manual_time", False),
+    ("again/boot/vantor/chain/nodes:1000/workers:1/iterations:1/manual_time", False)])
+def test_a_benchmark_is_chosen_by_its_whole_name_and_size(name, chosen):
+    option, _, pattern = graph.only("boot/vantor/chain", 1000, 1).partition("=")
+    assert option == "--benchmark_filter"
+    assert bool(re.search(pattern, name)) == chosen
+
+
+def test_instructions_that_were_not_counted_are_no_figure():
+    assert collected("==7== Collected : 1234\n") == 1234
+    for text in ("==7== Collected : 0\n", ""):
+        with pytest.raises(BenchError, match="^callgrind counted nothing: "):
+            collected(text)
+
+
+def test_the_report_begins_with_the_limits_that_were_missed():
+    kept = Row("group", "quick", "ours", 1, "us", "theirs", 1, [1.0], limit=1.0)
+    free = Row("group", "whatever", "ours", 9, "us", "theirs", 1, [9.0])
+    missed = Row("group", "slow", "ours", 3, "us", "theirs", 2, [1.5], limit=1.25)
+    assert summary([kept, free]) == ["Of 1 ratios with a limit, none missed it."]
+    assert summary([kept, missed, free]) == [
+        "Of 2 ratios with a limit, 1 missed it:", "",
+        "- slow, beside theirs: 1.50, the limit is 1.25"]
 
 
 def test_a_drawing_holds_every_point():

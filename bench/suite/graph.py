@@ -7,7 +7,8 @@ from suite.results import Curve
 GROUP = "graph"
 SHAPES = ["independent", "layered", "chain"]
 PROGRAMS = {"vantor": "vantor", "flow": "oneTBB"}
-SMALL = 10000  # nodes of a graph that is also run again and again in one process
+LARGEST_AGAIN = 100000  # nodes of a graph that is also run again and again in one process
+FIRST_RUNS = {1000: 27, 10000: 9}  # a small graph is over soon: it is seen in so many processes
 
 
 def _limit(shape, workers):
@@ -25,9 +26,8 @@ def _per_node(host, name, count, workers=None):
     return host.run_benchmark("bench-graph", only(name, count, workers))["real_time"] / count
 
 
-def _first_run(host, program, shape, count, workers):
-    """The first run of a process. One of a small graph is short and is seen in many processes."""
-    processes = {1000: 27, 10000: 9}.get(count, 1)
+def _first_run(host, processes, program, shape, count, workers):
+    """The first run of a process: the median of several processes."""
     return statistics.median(_per_node(host, f"boot/{program}/{shape}", count, workers)
                              for _ in range(processes))
 
@@ -48,8 +48,9 @@ def _measure_shape(host, results, shape, counts):
     keys = [(program, workers, count)
             for count in counts for workers in (1, 8) for program in PROGRAMS]
     figures = results.alternate(f"{GROUP}: {shape}", {
-        key: lambda key=key: _first_run(host, key[0], shape, key[2], key[1]) for key in keys})
-    _compare(results, shape, counts, figures, "", _limit)
+        key: lambda key=key: _first_run(host, 1 if results.quick else FIRST_RUNS.get(key[2], 1),
+                                        key[0], shape, key[2], key[1]) for key in keys})
+    _compare(results, shape, counts, figures, "")
     small, large = counts[-1] // 100 if counts[-1] // 100 in counts else counts[0], counts[-1]
     for workers in (1, 8):
         results.compare(GROUP, f"{shape}, {_workers(workers)}, from {small:,} to {large:,} nodes",
@@ -68,16 +69,15 @@ def _measure_again(host, results, shape, counts):
     figures = results.alternate(f"{GROUP}: {shape}, again", {
         key: lambda key=key: _per_node(host, f"again/{key[0]}/{shape}", key[2], key[1])
         for key in keys})
-    # Without limits: those are for what a boot is, a graph that its process runs once.
-    _compare(results, shape, counts, figures, ", again and again", lambda shape, workers: None)
+    _compare(results, shape, counts, figures, ", again and again")
 
 
-def _compare(results, shape, counts, figures, what, limit):
+def _compare(results, shape, counts, figures, what):
     for count in counts:
         for workers in (1, 8):
             results.compare(GROUP, f"{count:,} nodes, {shape}, {_workers(workers)}{what}",
                             "ns/node", ("vantor", figures["vantor", workers, count]),
-                            ("oneTBB", figures["flow", workers, count]), limit(shape, workers))
+                            ("oneTBB", figures["flow", workers, count]), _limit(shape, workers))
         if shape == "chain":
             _beside_one(results, count, what, figures["vantor", 8, count],
                         figures["vantor", 1, count])
@@ -103,15 +103,15 @@ def measure(host, results):
     _check(host, 1000)
     for shape in SHAPES:
         _measure_shape(host, results, shape, counts)
-        _measure_again(host, results, shape, [count for count in counts if count <= SMALL])
+        _measure_again(host, results, shape, [count for count in counts if count <= LARGEST_AGAIN])
     _measure_long_chain(host, results, counts[-1])
 
 
 def measure_memory(host, results):
     """The bytes by which the process grows, beside those that the nodes and names are made of."""
     count = 10000 if results.quick else 100000
-    for kind, label, limit in (("plugin", "debug plugins", 1.2), ("barrier", "barriers", 1.2),
-                               ("graph", "plugins and barriers, linked", None)):
+    for kind, label in (("plugin", "debug plugins"), ("barrier", "barriers"),
+                        ("graph", "plugins and barriers, linked")):
         grown, own = [], []
         for number in range(results.rounds):
             results.progress.say(f"memory: {label}, round {number + 1} of {results.rounds}")
@@ -119,4 +119,4 @@ def measure_memory(host, results):
             grown.append(figures["resident"] / count)
             own.append(figures["own"] / count)
         results.compare("memory", f"{count:,} {label}", "bytes/node", ("resident", grown),
-                        ("nodes and names", own), limit)
+                        ("nodes and names", own), 1.2)

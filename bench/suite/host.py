@@ -151,8 +151,9 @@ class Host:
             raise BenchError(f"{program} {' '.join(map(str, arguments))[:80]}: "
                              f"not done within {limit} s") from None
         if done.returncode != 0:
+            last = (done.stderr.splitlines() or [""])[-1]
             raise BenchError(f"{program} {' '.join(map(str, arguments))[:80]}: "
-                             f"status {done.returncode} {done.stderr.strip()}")
+                             f"status {done.returncode} {last}")
         return done.stdout
 
 

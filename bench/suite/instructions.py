@@ -1,4 +1,4 @@
-"""Group "instructions": how many instructions the single-threaded parts execute.
+"""Group "instructions": how many instructions the parts execute that one thread works on at a time.
 
 Counted by callgrind, so a noisy machine does not change them: a regression shows at once.
 """
@@ -17,10 +17,11 @@ GROUP = "instructions"
 _VALGRIND = ["--tool=callgrind", "--callgrind-out-file=/dev/null"]
 
 
-def _collected(errors):
-    found = re.search(r"Collected\s*:\s*(\d+)", errors)
+def collected(errors):
+    """The count in what callgrind writes to standard error."""
+    found = re.search(r"Collected\s*:\s*([1-9]\d*)", errors)
     if not found:
-        raise BenchError(f"callgrind says no count: {errors[-300:]}")
+        raise BenchError(f"callgrind counted nothing: {errors[-300:]}")
     return int(found[1])
 
 
@@ -31,7 +32,7 @@ def _count_part(host, program, *arguments):
     done = subprocess.run(command, capture_output=True, text=True, check=False)
     if done.returncode != 0:
         raise BenchError(f"{program} under callgrind: {done.stderr[-300:]}")
-    return _collected(done.stderr)
+    return collected(done.stderr)
 
 
 def _count_graph(host, name, count, workers=None):
@@ -40,7 +41,7 @@ def _count_graph(host, name, count, workers=None):
 
 def _count_whole(host, *command):
     """Instructions of a whole run in the private root, its children not included."""
-    return _collected(host.errors_of("/usr/bin/valgrind", "--vgdb=no", *_VALGRIND, *command))
+    return collected(host.errors_of("/usr/bin/valgrind", "--vgdb=no", *_VALGRIND, *command))
 
 
 def _graph(host, results, count):

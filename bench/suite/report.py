@@ -35,9 +35,10 @@ def _row(row):
         return f"| {row.work} | {row.subject} {ours} | | | | |"
     low, high = row.quartiles
     spread = f"{low:.2f} to {high:.2f}" if len(row.ratios) > 1 else ""
-    limit = "" if row.limit is None else "no growth" if row.growth else f"{row.limit:g}"
+    limit = f"no growth beyond chance: {row.verdict}" if row.growth else \
+        f"{row.limit:g} {row.verdict}" if row.verdict else ""
     cells = [row.work, f"{row.subject} {ours}", f"{row.reference} {figure(row.reference_value)}",
-             f"{row.ratio:.2f}", spread, f"{limit} {row.verdict}".strip()]
+             f"{row.ratio:.2f}", spread, limit]
     return "| " + " | ".join(cells).rstrip() + " |"
 
 
@@ -54,9 +55,18 @@ def _conditions(meta):
     return lines
 
 
+def summary(rows):
+    """How many limits there are, and the rows that miss theirs."""
+    verdicts = [row.verdict for row in rows if row.verdict]
+    missed = [f"- {row.work}, beside {row.reference}: {row.ratio:.2f}, the limit is {row.limit:g}"
+              for row in rows if row.verdict == "missed"]
+    line = f"Of {len(verdicts)} ratios with a limit, {len(missed) or 'none'} missed it"
+    return [line + ":", "", *missed] if missed else [line + "."]
+
+
 def table(results, meta, level=2):
     """The whole report as Markdown."""
-    lines = _conditions(meta)
+    lines = [*_conditions(meta), "", *summary(results.rows)]
     for group, title in TITLES.items():
         rows = [row for row in results.rows if row.group == group]
         if rows:
