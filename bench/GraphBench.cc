@@ -96,20 +96,14 @@ std::size_t NodeCount(const benchmark::State& state) {
 
 int WorkerCount(const benchmark::State& state) { return static_cast<int>(state.range(1)); }
 
+// With `warm`, another graph runs first: caches and allocators are warm after it.
 template <typename Graph>
-void Boot(benchmark::State& state, const std::string& kind) {
+void Runs(benchmark::State& state, const std::string& kind, bool warm) {
     const GraphShape shape = MakeShape(kind, NodeCount(state));
     Graph graph(WorkerCount(state));
-    while (state.KeepRunning()) {
-        state.SetIterationTime(graph.Run(shape));
+    if (warm) {
+        graph.Run(shape);
     }
-}
-
-template <typename Graph>
-void Again(benchmark::State& state, const std::string& kind) {
-    const GraphShape shape = MakeShape(kind, NodeCount(state));
-    Graph graph(WorkerCount(state));
-    graph.Run(shape);  // caches and allocators are warm after this
     while (state.KeepRunning()) {
         state.SetIterationTime(graph.Run(shape));
     }
@@ -186,11 +180,11 @@ void RegisterRuns(const std::string& program, const std::string& kind) {
             ->Args({smallest, workers})
             ->Iterations(1);
         for (std::int64_t count = smallest; count <= largest; count *= sizeStep) {
-            Register("boot/" + name, &Boot<Graph>, kind)
+            Register("boot/" + name, &Runs<Graph>, kind, false)
                 ->ArgNames({"nodes", "workers"})
                 ->Args({count, workers})
                 ->Iterations(1);
-            Register("again/" + name, &Again<Graph>, kind)
+            Register("again/" + name, &Runs<Graph>, kind, true)
                 ->ArgNames({"nodes", "workers"})
                 ->Args({count, workers})
                 ->Iterations(1)
