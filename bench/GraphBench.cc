@@ -42,11 +42,11 @@ public:
     std::string DotAttributes() const override { return {}; }
 };
 
-std::atomic<std::size_t> runs{0};
+std::atomic<std::size_t> nodesRun{0};
 
 class CountingNode : public EmptyNode {
 public:
-    void Run() override { ++runs; }
+    void Run() override { ++nodesRun; }
 };
 
 template <typename Kind>
@@ -66,9 +66,9 @@ public:
     double Run(const GraphShape& shape) { return RunNodes<EmptyNode>(shape); }
 
     double RunCounted(const GraphShape& shape) {
-        runs = 0;
+        nodesRun = 0;
         const double taken = RunNodes<CountingNode>(shape);
-        if (runs != shape.count) {
+        if (nodesRun != shape.count) {
             throw std::runtime_error("the executor did not run every node once");
         }
         return taken;
@@ -98,7 +98,7 @@ int WorkerCount(const benchmark::State& state) { return static_cast<int>(state.r
 
 // With `warm`, another graph runs first: caches and allocators are warm after it.
 template <typename Graph>
-void Runs(benchmark::State& state, const std::string& kind, bool warm) {
+void TimeGraphs(benchmark::State& state, const std::string& kind, bool warm) {
     const GraphShape shape = MakeShape(kind, NodeCount(state));
     Graph graph(WorkerCount(state));
     if (warm) {
@@ -180,11 +180,11 @@ void RegisterRuns(const std::string& program, const std::string& kind) {
             ->Args({smallest, workers})
             ->Iterations(1);
         for (std::int64_t count = smallest; count <= largest; count *= sizeStep) {
-            Register("boot/" + name, &Runs<Graph>, kind, false)
+            Register("boot/" + name, &TimeGraphs<Graph>, kind, false)
                 ->ArgNames({"nodes", "workers"})
                 ->Args({count, workers})
                 ->Iterations(1);
-            Register("again/" + name, &Runs<Graph>, kind, true)
+            Register("again/" + name, &TimeGraphs<Graph>, kind, true)
                 ->ArgNames({"nodes", "workers"})
                 ->Args({count, workers})
                 ->Iterations(1)
