@@ -2,18 +2,11 @@
 
 #include <algorithm>
 
+#include "graph/SpinPause.h"
+
 namespace vantor {
 
 namespace {
-
-// Tells the processor that this loop waits for another thread.
-void Pause(int length) {
-    for (int i = 0; i < length; ++i) {
-#if defined(__i386__) || defined(__x86_64__)
-        __builtin_ia32_pause();
-#endif
-    }
-}
 
 // What is done under the lock mostly takes far less than a microsecond. Who has found it taken
 // therefore tries again for about as long as going to sleep and being woken may take, and so spares
@@ -23,7 +16,7 @@ void AcquireTaken(pthread_mutex_t& mutex) {
     constexpr int tries = 10;
     constexpr int longestPause = 128;
     for (int i = 1, pause = 1; i < tries; ++i) {
-        Pause(pause);
+        SpinPause(pause);
         pause = std::min(2 * pause, longestPause);
         if (pthread_mutex_trylock(&mutex) == 0) {
             return;

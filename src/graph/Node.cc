@@ -1,11 +1,15 @@
 #include "graph/Node.h"
 
+#include <sched.h>
+
 #include <algorithm>
+#include <chrono>
 #include <utility>
 #include <vector>
 
 #include "graph/Executor.h"
 #include "graph/GlobalLock.h"
+#include "graph/SpinPause.h"
 #include "plugins/Exceptions.h"
 
 namespace vantor {
@@ -18,7 +22,7 @@ void Remove(Node::Edges& edges, const Node* node) {
 
 }  // namespace
 
-std::size_t Node::unfinished = 0;
+std::atomic<std::int32_t> Node::unfinished{0};
 
 Node::Node(std::string nodeName) : name(std::move(nodeName)) {
     if (pthread_cond_init(&doneCondition, nullptr) != 0) {
@@ -28,6 +32,7 @@ Node::Node(std::string nodeName) : name(std::move(nodeName)) {
 
 Node::~Node() {
     const GlobalLockGuard guard;
+    BecomeDone();
     for (Node* dependency : dependencies) {
         Remove(dependency->dependents, this);
     }
@@ -72,6 +77,26 @@ void Node::ScheduleLocked(Executor& executor) {
     }
 }
 
+void Node::CountUnfinished(std::int32_t step) {
+    unfinished.store(unfinished.load(std::memory_order_relaxed) + step, std::memory_order_relaxed);
+}
+
+// A graph of short nodes is done before this thread would have fallen asleep and been woken. Other
+// threads may have the processor meanwhile; and between two looks is a pause, as each look takes
+// the count away from the processor that changes it.
+void Node::LookOutForTheEnd(GlobalLockGuard& guard) {
+    using Clock = std::chrono::steady_clock;
+    constexpr std::chrono::microseconds patience{200};
+    constexpr int pause = 128;
+    guard.Release();
+    const auto end = Clock::now() + patience;
+    do {
+        sched_yield();
+        SpinPause(pause);
+    } while (AnyUnfinished() && Clock::now() < end);
+    guard.Retake();
+}
+
 // Depth first, in the order of the lists: a dependency that nobody has requested yet is requested,
 // with all that it waits for, before the next one is looked at. This node's own request ends here.
 void Node::RequestBelow(Node& firstIdle, Executor& executor) {
@@ -89,7 +114,7 @@ void Node::RequestBelow(Node& firstIdle, Executor& executor) {
 }
 
 void Node::BecomeWaiting() {
-    ++unfinished;
+    CountUnfinished(1);
     state = NodeState::Waiting;
     settled = 0;
 }
@@ -124,10 +149,7 @@ void Node::Execute(Executor& executor, GlobalLockGuard& guard) {
     guard.Release();
     Run();
     guard.Retake();
-    if (state == NodeState::Queued) {
-        --unfinished;
-    }
-    state = NodeState::Done;
+    BecomeDone();
     for (Node* dependent : dependents) {
         if (dependent->state == NodeState::Waiting) {
             dependent->QueueIfReady(executor);
@@ -152,6 +174,13 @@ void Node::WaitDoneLocked() {
 
 void Node::MarkDone() {
     const GlobalLockGuard guard;
+    BecomeDone();
+}
+
+void Node::BecomeDone() {
+    if (state == NodeState::Waiting || state == NodeState::Queued) {
+        CountUnfinished(-1);
+    }
     state = NodeState::Done;
 }
 

@@ -3,6 +3,7 @@
 
 #include <pthread.h>
 
+#include <atomic>
 #include <boost/container/small_vector.hpp>
 #include <cstddef>
 #include <cstdint>
@@ -90,13 +91,16 @@ public:
     // No worker chooses before all are requested. The calling thread must not hold the lock.
     template <typename Nodes>
     static void RunAll(const Nodes& nodes, Executor& executor) {
-        const GlobalLockGuard guard;
+        GlobalLockGuard guard;
         for (Node* node : nodes) {
             node->ScheduleLocked(executor);
         }
+        if (AnyUnfinished()) {
+            LookOutForTheEnd(guard);
+        }
         // What is requested last is mostly done last: from that end few nodes are found undone, and
         // this thread is seldom woken to take the lock from the workers.
-        for (auto node = std::rbegin(nodes); node != std::rend(nodes) && unfinished != 0; ++node) {
+        for (auto node = std::rbegin(nodes); node != std::rend(nodes) && AnyUnfinished(); ++node) {
             (*node)->WaitDoneLocked();
         }
     }
@@ -116,6 +120,9 @@ private:
     // The caller of any of these holds the lock.
     void ScheduleLocked(Executor& executor);
     void WaitDoneLocked();
+    static bool AnyUnfinished() { return unfinished.load(std::memory_order_relaxed) != 0; }
+    static void CountUnfinished(std::int32_t step);
+    static void LookOutForTheEnd(GlobalLockGuard& guard);
     std::int32_t HeightLocked() {
         if (!heightKnown) {
             ComputeHeight();
@@ -124,15 +131,17 @@ private:
     }
     void RequestBelow(Node& firstIdle, Executor& executor);
     void BecomeWaiting();
+    void BecomeDone();
     void EndRequest(Executor& executor);
     Node* NextIdleDependency();
     void QueueIfReady(Executor& executor);
     void ComputeHeight();
     Node* NextWithoutHeight();
 
-    // So many nodes have been requested and are not done; too many where one that was requested is
-    // declared done or destroyed, but never too few. Of all executors together.
-    static std::size_t unfinished;
+    // So many nodes have been requested and are neither done nor destroyed, of all executors
+    // together. Written only with the lock held and read without it by LookOutForTheEnd(): hence
+    // atomic.
+    static std::atomic<std::int32_t> unfinished;
 
     bool heightKnown = false;
     std::int32_t height = -1;

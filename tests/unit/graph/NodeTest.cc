@@ -246,6 +246,47 @@ TEST_F(NodeTest, NobodyIsWokenForANodeThatNobodyWaitsFor) {
     EXPECT_EQ(Faults().condBroadcast.Calls(), 0);
 }
 
+// Counts how often the thread that constructs it goes to sleep; tells that thread from others.
+class OwnWaits {
+public:
+    OwnWaits() : self(pthread_self()) {
+        Faults().condWait.Before([this] { sleeps += OwnThread() ? 1 : 0; });
+    }
+
+    bool OwnThread() const { return pthread_equal(self, pthread_self()) != 0; }
+
+    std::atomic<int> sleeps{0};
+
+private:
+    pthread_t self;
+};
+
+TEST_F(NodeTest, RunAllLooksOutForTheEndWithoutTheLockBeforeItSleeps) {
+    GraphText graph({"a provides x", "b requires x"});
+    const OwnWaits own;
+    std::atomic<int> turns{0};
+    Faults().yield.Before([&] {
+        if (own.OwnThread()) {
+            ++turns;
+            EXPECT_FALSE(GlobalLock::HeldByCurrentThread());
+            EXPECT_TRUE(WaitUntil([&] { return graph["b"].State() == NodeState::Done; }));
+        }
+    });
+    Executor executor(1, false);
+    Node::RunAll(std::vector<Node*>{&graph["a"], &graph["b"]}, executor);
+    EXPECT_GT(turns, 0);
+    EXPECT_EQ(own.sleeps, 0);
+}
+
+TEST_F(NodeTest, RunAllSleepsWhereTheEndDoesNotComeSoon) {
+    GraphText graph({"a"});
+    const OwnWaits own;
+    graph["a"].onRun = [&] { EXPECT_TRUE(WaitUntil([&] { return own.sleeps > 0; })); };
+    Executor executor(1, false);
+    Node::RunAll(std::vector<Node*>{&graph["a"]}, executor);
+    EXPECT_GT(own.sleeps, 0);
+}
+
 TEST_F(NodeTest, RunAllDoesNotWaitForNothing) {
     Executor executor(0, false);
     Node::RunAll(std::vector<Node*>(), executor);
