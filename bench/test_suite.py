@@ -101,11 +101,6 @@ def test_candidates_take_turns_in_turning_order():
     assert figures == {"a": [1, 6], "b": [2, 5], "c": [3, 4]}
 
 
-def test_what_varies_much_takes_more_rounds():
-    results = Results(rounds=2, quick=True)
-    assert results.alternate("more", {"a": lambda: 1}, times=3) == {"a": [1] * 6}
-
-
 def test_the_figure_of_a_round_is_the_mean_of_its_turns():
     order = []
     results = Results(rounds=1, quick=True)

@@ -69,12 +69,12 @@ def _check(host, shape, count):
     host.root.remove(LOG)
 
 
-def _side_by_side(host, results, shape, counts, boots):
+def _side_by_side(host, results, shape, counts):
     """Graphs that eight commands at a time work on, all sizes in the same rounds.
 
     A machine has quick and slow seconds: the median of short runs is that of the quick ones, and a
-    long run is a mean of both. Sizes can be compared when a round of each sees as many of them:
-    `boots` is how often a round boots the largest one.
+    long run is a mean of both. Sizes can be compared when a round of each sees as many of them: it
+    boots the largest one once.
     """
     candidates, often = {}, {}
     for count in counts:
@@ -83,7 +83,7 @@ def _side_by_side(host, results, shape, counts, boots):
         candidates["bare", count] = lambda case=case: case.bare(8)
         candidates["ninja", count] = case.ninja
         candidates["make", count] = case.make
-        often["vantor", count] = often["bare", count] = boots * counts[-1] // count
+        often["vantor", count] = often["bare", count] = counts[-1] // count
     measured = results.alternate(f"{GROUP}: {shape}", candidates, often=often)
     figures, processor = _by_clock(measured), _by_processor(measured)
     for count in counts:
@@ -135,7 +135,7 @@ def _one_by_one(host, results, count):
         "serial": alone.vantor,
         "ninja": chain.ninja,
         "make": chain.make,
-    }, times=2, often={"chain": 3, "bare": 3, "serial": 3, "ninja": 3})
+    }, often={"chain": 5, "bare": 5, "serial": 5, "ninja": 5})
     figures, processor = _by_clock(measured), _by_processor(measured)
     for name, label, limit in (("bare", "1 bare thread", 1.08), ("ninja", "ninja -j8", 1.03),
                                ("make", "make -j8", None)):
@@ -155,7 +155,7 @@ def measure(host, results):
     counts = [100, 300] if results.quick else [1000, 5000]
     for shape in ("independent", "layered", "chain"):
         _check(host, shape, 100)
-    for shape, boots in (("independent", 1), ("layered", 2)):  # who waits for others varies more
-        _curve(results, shape, counts, _side_by_side(host, results, shape, counts, boots))
+    for shape in ("independent", "layered"):
+        _curve(results, shape, counts, _side_by_side(host, results, shape, counts))
     _one_by_one(host, results, counts[0])
     host.clear_plugins()

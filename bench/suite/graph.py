@@ -39,9 +39,9 @@ def _check(host, count):
                 _per_node(host, f"check/{program}/{shape}", count, workers)
 
 
-def _beside_one(results, count, what, eight, one):
+def _beside_one(results, count, what, eight, one, limit):
     results.compare(GROUP, f"chain of {count:,} nodes, 8 workers beside 1{what}", "ns/node",
-                    ("vantor, 8 workers", eight), ("vantor, 1 worker", one), 3.0)
+                    ("vantor, 8 workers", eight), ("vantor, 1 worker", one), limit)
 
 
 def _measure_shape(host, results, shape, counts):
@@ -50,7 +50,7 @@ def _measure_shape(host, results, shape, counts):
     figures = results.alternate(f"{GROUP}: {shape}", {
         key: lambda key=key: _first_run(host, 1 if results.quick else FIRST_RUNS.get(key[2], 1),
                                         key[0], shape, key[2], key[1]) for key in keys})
-    _compare(results, shape, counts, figures, "")
+    _compare(results, shape, counts, figures)
     small, large = counts[-1] // 100 if counts[-1] // 100 in counts else counts[0], counts[-1]
     for workers in (1, 8):
         results.compare(GROUP, f"{shape}, {_workers(workers)}, from {small:,} to {large:,} nodes",
@@ -69,18 +69,19 @@ def _measure_again(host, results, shape, counts):
     figures = results.alternate(f"{GROUP}: {shape}, again", {
         key: lambda key=key: _per_node(host, f"again/{key[0]}/{shape}", key[2], key[1])
         for key in keys})
-    _compare(results, shape, counts, figures, ", again and again")
+    _compare(results, shape, counts, figures, ", again and again", limited=False)
 
 
-def _compare(results, shape, counts, figures, what):
+def _compare(results, shape, counts, figures, what="", limited=True):
     for count in counts:
         for workers in (1, 8):
             results.compare(GROUP, f"{count:,} nodes, {shape}, {_workers(workers)}{what}",
                             "ns/node", ("vantor", figures["vantor", workers, count]),
-                            ("oneTBB", figures["flow", workers, count]), _limit(shape, workers))
+                            ("oneTBB", figures["flow", workers, count]),
+                            _limit(shape, workers) if limited else None)
         if shape == "chain":
             _beside_one(results, count, what, figures["vantor", 8, count],
-                        figures["vantor", 1, count])
+                        figures["vantor", 1, count], 3.0 if limited else None)
 
 
 def _workers(count):

@@ -96,20 +96,18 @@ class Results:
         self.rounds, self.quick = rounds, quick
         self.progress, self.rows, self.curves, self.failures = Progress(), [], [], []
 
-    def alternate(self, what, candidates, times=1, often=None):
+    def alternate(self, what, candidates, often=None):
         """Measures the candidates in rounds, in turning order; a list of figures for each.
 
         candidates  name -> function that measures once and returns the figure, or a tuple of figures
-        times       factor on the number of rounds, for what varies much and is short
         often       name -> how often a round measures it, once where nothing is said: in turn with
                     the others and spread over the round, whose figure is the mean
         """
-        rounds = times * self.rounds
         counts = {name: (often or {}).get(name, 1) for name in candidates}
         turns = max(counts.values())
         figures = {name: [] for name in candidates}
-        for number in range(rounds):
-            self.progress.say(f"{what}, round {number + 1} of {rounds}")
+        for number in range(self.rounds):
+            self.progress.say(f"{what}, round {number + 1} of {self.rounds}")
             taken = {name: [] for name in candidates}
             for turn in range(turns):
                 order = [name for name, count in counts.items() if turn * count % turns < count]
