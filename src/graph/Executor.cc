@@ -84,14 +84,10 @@ void Executor::StopWorkers() {
     threads.clear();
 }
 
-// Who sleeps is woken first: waking takes a while, and so may computing heights. The lock keeps the
-// workers from looking before the node is there.
 void Executor::Enqueue(Node& node) {
-    if (someSleep) {
-        someSleep = false;
-        GlobalLock::Broadcast(workAvailable);
-    }
     queue.Push(node);
+    wakeUpOwed = wakeUpOwed || someSleep;
+    someSleep = false;
 }
 
 std::size_t Executor::PickNext() const {

@@ -5,8 +5,10 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <utility>
 #include <vector>
 
+#include "graph/GlobalLock.h"
 #include "graph/ReadyQueue.h"
 
 namespace vantor {
@@ -18,8 +20,8 @@ class Node;
 // equals the one that has been ready longest, or a random one. One worker gives serial order.
 //
 // A run: construct the executor, Node::RunAll() the plugins in load order, destroy the executor.
-// The ready queue, `stopping` and `someSleep` are guarded by GlobalLock; `threads` belongs to the
-// thread that constructs and destroys the executor.
+// The ready queue, `stopping`, `someSleep` and `wakeUpOwed` are guarded by GlobalLock; `threads`
+// belongs to the thread that constructs and destroys the executor.
 class Executor {
 public:
     // Starts `threadCount` workers; none when it is below 1, and then no node is ever run. With
@@ -34,10 +36,16 @@ public:
     // never run.
     virtual ~Executor();
 
-    // Puts a node that has become ready into the queue and wakes every worker that sleeps. Only for
-    // Node, which holds GlobalLock and has set the node's state; the node must live until it is
-    // done or the executor is gone.
+    // Puts a node that has become ready into the queue. Every worker that sleeps is to be woken for
+    // it: from now on that is owed. Only for Node, which holds GlobalLock and has set the node's
+    // state; the node must live until it is done or the executor is gone.
     void Enqueue(Node& node);
+
+    // Whether it is owed to the workers that sleep to wake them. Who is told so, and nobody after
+    // it, is to call WakeWorkers(): best without the lock, which they want at once. The caller
+    // holds GlobalLock.
+    bool TakeWakeUp() { return std::exchange(wakeUpOwed, false); }
+    void WakeWorkers() { GlobalLock::Broadcast(workAvailable); }
 
     // Which node to run next: its position among the highest of the queue, counted from 0 in the
     // order in which they became ready. The caller holds GlobalLock, and the queue is not empty.
@@ -58,15 +66,17 @@ private:
     void StartWorkers(std::int32_t threadCount);
     void StopWorkers();
 
-    // What idle workers sleep on: broadcast when a node is queued, if one may sleep, and when the
-    // pool stops.
+    // What idle workers sleep on: broadcast when a node has been queued, if one may sleep, and when
+    // the pool stops.
     pthread_cond_t workAvailable;
     ReadyQueue queue;
     std::vector<pthread_t> threads;
     bool stopping = false;
-    // Whether a worker has gone to sleep since the last broadcast: if none has, nobody would hear
-    // another one. A whole boot is mostly requested before the first worker has the lock.
+    // Whether a worker has gone to sleep since a node was queued last: if none has, nobody would
+    // hear another broadcast. A whole boot is mostly requested before the first worker has the
+    // lock.
     bool someSleep = false;
+    bool wakeUpOwed = false;
     bool randomize;
 };
 

@@ -33,6 +33,8 @@ public:
 
     std::string DotAttributes() const override;
 
+    bool RunsUnderLock() const override { return true; }
+
 private:
     explicit InitBarrier(const std::string& barrierName);
 

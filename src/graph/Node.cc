@@ -60,8 +60,18 @@ void Node::AddDependent(Node& other) {
 }
 
 void Node::Schedule(Executor& executor) {
-    const GlobalLockGuard guard;
+    GlobalLockGuard guard;
     ScheduleLocked(executor);
+    ReleaseAndWake(guard, executor);
+}
+
+// A woken worker wants the lock at once: found taken, it would send the worker to sleep again.
+void Node::ReleaseAndWake(GlobalLockGuard& guard, Executor& executor) {
+    const bool wake = executor.TakeWakeUp();
+    guard.Release();
+    if (wake) {
+        executor.WakeWorkers();
+    }
 }
 
 void Node::ScheduleLocked(Executor& executor) {
@@ -84,17 +94,15 @@ void Node::CountUnfinished(std::int32_t step) {
 // A graph of short nodes is done before this thread would have fallen asleep and been woken. Other
 // threads may have the processor meanwhile; and between two looks is a pause, as each look takes
 // the count away from the processor that changes it.
-void Node::LookOutForTheEnd(GlobalLockGuard& guard) {
+void Node::LookOutForTheEnd() {
     using Clock = std::chrono::steady_clock;
     constexpr std::chrono::microseconds patience{200};
     constexpr int pause = 128;
-    guard.Release();
     const auto end = Clock::now() + patience;
     do {
         sched_yield();
         SpinPause(pause);
     } while (AnyUnfinished() && Clock::now() < end);
-    guard.Retake();
 }
 
 // Depth first, in the order of the lists: a dependency that nobody has requested yet is requested,
@@ -146,7 +154,11 @@ void Node::QueueIfReady(Executor& executor) {
 }
 
 void Node::Execute(Executor& executor, GlobalLockGuard& guard) {
-    guard.Release();
+    if (RunsUnderLock()) {
+        guard.Release();
+    } else {
+        ReleaseAndWake(guard, executor);
+    }
     Run();
     guard.Retake();
     BecomeDone();

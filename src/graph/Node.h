@@ -58,6 +58,10 @@ public:
     // half-way leaves no pointer to itself behind.
     virtual ~Node();
 
+    // Whether Run() holds the lock from its beginning to its end. No worker could choose a node
+    // meanwhile: those that sleep are woken after it, together with what it makes ready.
+    virtual bool RunsUnderLock() const { return false; }
+
     const std::string& Name() const { return name; }
 
     // These take no lock: who walks a list holds it.
@@ -95,9 +99,11 @@ public:
         for (Node* node : nodes) {
             node->ScheduleLocked(executor);
         }
+        ReleaseAndWake(guard, executor);
         if (AnyUnfinished()) {
-            LookOutForTheEnd(guard);
+            LookOutForTheEnd();
         }
+        guard.Retake();
         // What is requested last is mostly done last: from that end few nodes are found undone, and
         // this thread is seldom woken to take the lock from the workers.
         for (auto node = std::rbegin(nodes); node != std::rend(nodes) && AnyUnfinished(); ++node) {
@@ -117,12 +123,15 @@ public:
 private:
     friend class ReadyQueue;  // chains the nodes that are ready through `next`
 
-    // The caller of any of these holds the lock.
+    // These take no lock and need none.
+    static bool AnyUnfinished() { return unfinished.load(std::memory_order_relaxed) != 0; }
+    static void LookOutForTheEnd();
+
+    // The caller of any of these holds the lock; ReleaseAndWake() gives it up.
+    static void CountUnfinished(std::int32_t step);
     void ScheduleLocked(Executor& executor);
     void WaitDoneLocked();
-    static bool AnyUnfinished() { return unfinished.load(std::memory_order_relaxed) != 0; }
-    static void CountUnfinished(std::int32_t step);
-    static void LookOutForTheEnd(GlobalLockGuard& guard);
+    static void ReleaseAndWake(GlobalLockGuard& guard, Executor& executor);
     std::int32_t HeightLocked() {
         if (!heightKnown) {
             ComputeHeight();
