@@ -1,5 +1,7 @@
 #include "graph/GlobalLock.h"
 
+#include <signal.h>
+
 #include <algorithm>
 
 #include "graph/SpinPause.h"
@@ -25,6 +27,25 @@ void AcquireTaken(pthread_mutex_t& mutex) {
     pthread_mutex_lock(&mutex);
 }
 
+// Keeps the end of a child process from waking this thread, which would be for nothing: the kernel
+// gives SIGCHLD to any thread that does not block it (signal(7)), and system() blocks it in the one
+// that waits for the command. A signal that has no other thread to go to is delivered afterwards.
+class SigchldBlock {
+public:
+    SigchldBlock() {
+        sigset_t set;
+        sigemptyset(&set);
+        sigaddset(&set, SIGCHLD);
+        pthread_sigmask(SIG_BLOCK, &set, &before);
+    }
+    ~SigchldBlock() { pthread_sigmask(SIG_SETMASK, &before, nullptr); }
+    SigchldBlock(const SigchldBlock&) = delete;
+    SigchldBlock& operator=(const SigchldBlock&) = delete;
+
+private:
+    sigset_t before{};
+};
+
 }  // namespace
 
 pthread_mutex_t GlobalLock::mutex = PTHREAD_RECURSIVE_MUTEX_INITIALIZER_NP;
@@ -44,6 +65,7 @@ void GlobalLock::Unlock() {
 }
 
 void GlobalLock::Wait(pthread_cond_t& condition) {
+    const SigchldBlock block;
     holdCount.store(0, std::memory_order_release);
     pthread_cond_wait(&condition, &mutex);
     RecordHolder(1);

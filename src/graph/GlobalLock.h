@@ -25,7 +25,8 @@ public:
     static void Unlock();
 
     // Releases the lock, waits for `condition` and takes the lock again. The calling thread must
-    // hold it exactly once. As with any condition variable it may wake without a broadcast.
+    // hold it exactly once. As with any condition variable it may wake without a broadcast. SIGCHLD
+    // is blocked in the thread meanwhile, and afterwards its signal mask is as it was.
     static void Wait(pthread_cond_t& condition);
 
     static void Broadcast(pthread_cond_t& condition);

@@ -117,3 +117,14 @@ def test_a_debug_plugin_can_be_invoked(root, vantor):
     root.debug_configuration(saying("inject"))
     result = vantor("--invoke", "--method=start", "--plugin=inject.debug")
     assert (result.status, result.messages, root.ran()) == (0, [], ["inject"])
+
+
+def test_no_command_finds_a_signal_blocked(root, vantor):
+    """Not even SIGCHLD, which a worker blocks while it sleeps."""
+    blocked = ("while read name value; do case $name in SigBlk*) echo $value >>/tmp/ran;; esac; "
+               "done </proc/self/status")
+    root.debug_configuration(f"first: :passed:{blocked}", f"second:passed: :{blocked}")
+    for options in ([], ["--parallel"]):
+        vantor(*options)
+        assert root.ran() == ["0" * 16] * 2
+        root.remove("/tmp/ran")

@@ -2,11 +2,14 @@
 
 #include <gtest/gtest.h>
 #include <pthread.h>
+#include <signal.h>
 
 #include <atomic>
+#include <csignal>
 #include <thread>
 #include <vector>
 
+#include "graph/GraphFaults.h"
 #include "support/Sanitizers.h"
 #include "support/Waiting.h"
 
@@ -14,6 +17,7 @@ namespace vantor {
 
 namespace {
 
+using support::Faults;
 using support::WaitUntil;
 
 constexpr int threadCount = 6;
@@ -186,6 +190,63 @@ TEST(GlobalLockTest, BroadcastWakesEveryWaiter) {
     });
     waker.join();
     EXPECT_EQ(waiting, 0);
+}
+
+// What becomes of SIGCHLD in a thread that waits, in a wait that ends at once.
+class SigchldTest : public support::GraphTest {
+protected:
+    SigchldTest() {
+        Faults().condWait.FailCall(1, 0);
+        pthread_sigmask(SIG_BLOCK, nullptr, &before);
+    }
+    ~SigchldTest() override { pthread_sigmask(SIG_SETMASK, &before, nullptr); }
+
+    static void WaitOnce() {
+        pthread_cond_t condition = PTHREAD_COND_INITIALIZER;
+        const GlobalLockGuard guard;
+        GlobalLock::Wait(condition);
+    }
+
+    static bool IsBlocked() {
+        sigset_t mask;
+        pthread_sigmask(SIG_BLOCK, nullptr, &mask);
+        return sigismember(&mask, SIGCHLD) == 1;
+    }
+
+    sigset_t before{};
+};
+
+TEST_F(SigchldTest, IsBlockedOnlyWhileTheThreadWaits) {
+    bool blockedMeanwhile = false;
+    Faults().condWait.Before([&] { blockedMeanwhile = IsBlocked(); });
+    WaitOnce();
+    EXPECT_TRUE(blockedMeanwhile);
+    EXPECT_FALSE(IsBlocked());
+}
+
+TEST_F(SigchldTest, StaysBlockedWhereItWasBefore) {
+    sigset_t set;
+    sigemptyset(&set);
+    sigaddset(&set, SIGCHLD);
+    pthread_sigmask(SIG_BLOCK, &set, nullptr);
+    WaitOnce();
+    EXPECT_TRUE(IsBlocked());
+}
+
+int handled = 0;
+
+TEST_F(SigchldTest, IsDeliveredAfterTheWait) {
+    handled = 0;
+    const auto oldHandler = std::signal(SIGCHLD, [](int) { ++handled; });
+    int handledMeanwhile = -1;
+    Faults().condWait.Before([&] {
+        pthread_kill(pthread_self(), SIGCHLD);
+        handledMeanwhile = handled;
+    });
+    WaitOnce();
+    (void)std::signal(SIGCHLD, oldHandler);
+    EXPECT_EQ(handledMeanwhile, 0);
+    EXPECT_EQ(handled, 1);
 }
 
 TEST(GlobalLockGuardTest, HoldsTheLockWhileItLives) {
