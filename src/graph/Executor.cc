@@ -21,22 +21,13 @@ struct WorkerStart {
     std::int32_t index;
 };
 
-// Every node that is queued wakes all idle workers, and mostly all but one in vain. Where one short
-// node follows the other, a worker that went back to sleep at once would be there to be woken for
-// the very next one, at many times the cost of the node. So it first lets others have the
-// processor, and looks again.
-void GiveWay(GlobalLockGuard& guard) {
-    constexpr int turns = 3;
-    guard.Release();
-    for (int i = 0; i < turns; ++i) {
-        sched_yield();
-    }
-    guard.Retake();
-}
+// About as long as falling asleep and being woken take.
+constexpr std::chrono::microseconds soon{50};
 
 }  // namespace
 
-Executor::Executor(std::int32_t threadCount, bool randomizeEquals) : randomize(randomizeEquals) {
+Executor::Executor(std::int32_t threadCount, bool randomizeEquals)
+    : nodesComeSoon(threadCount > 1), randomize(randomizeEquals) {
     if (pthread_cond_init(&workAvailable, nullptr) != 0) {
         throw Exception("Condition variable for Executor could not be initialized");
     }
@@ -107,30 +98,40 @@ void* Executor::WorkerEntry(void* argument) {
 
 void Executor::RunWorker() {
     GlobalLockGuard guard;
-    bool sleptBriefly = false;
     while (!stopping) {
         while (HasReady()) {
             TakeNext().Execute(*this, guard);
             if (stopping) {
                 return;
             }
+            if (wakeUpOwed) {
+                nodesComeSoon = Clock::now() - lastFellAsleep < soon;
+            }
         }
-        // After a long sleep nodes come seldom, and giving way only takes processor time from them.
-        if (sleptBriefly) {
-            GiveWay(guard);
-        }
+        LookOutForNodes(guard);
         if (!HasReady() && !stopping) {
-            sleptBriefly = SleepUntilWoken();
+            lastFellAsleep = Clock::now();
+            someSleep = true;
+            GlobalLock::Wait(workAvailable);
         }
     }
 }
 
-bool Executor::SleepUntilWoken() {
-    constexpr std::chrono::microseconds brief{50};
-    const auto start = std::chrono::steady_clock::now();
-    someSleep = true;
-    GlobalLock::Wait(workAvailable);
-    return std::chrono::steady_clock::now() - start < brief;
+// Every node that is queued wakes all idle workers, and mostly all but one in vain. Where one short
+// node follows the other, a worker that went back to sleep at once would be there to be woken for
+// the very next one, at many times the cost of the node. So it looks again a few times before, and
+// lets others have the processor in between. Where nodes take long, that would only take processor
+// time from them.
+void Executor::LookOutForNodes(GlobalLockGuard& guard) {
+    constexpr int looks = 10;
+    constexpr int turns = 3;
+    for (int i = 0; i < looks && nodesComeSoon && !HasReady() && !stopping; ++i) {
+        guard.Release();
+        for (int turn = 0; turn < turns; ++turn) {
+            sched_yield();
+        }
+        guard.Retake();
+    }
 }
 
 }  // namespace vantor

@@ -3,6 +3,7 @@
 
 #include <pthread.h>
 
+#include <chrono>
 #include <cstddef>
 #include <cstdint>
 #include <utility>
@@ -20,8 +21,8 @@ class Node;
 // equals the one that has been ready longest, or a random one. One worker gives serial order.
 //
 // A run: construct the executor, Node::RunAll() the plugins in load order, destroy the executor.
-// The ready queue, `stopping`, `someSleep` and `wakeUpOwed` are guarded by GlobalLock; `threads`
-// belongs to the thread that constructs and destroys the executor.
+// `threads` belongs to the thread that constructs and destroys the executor; the fields that change
+// otherwise are guarded by GlobalLock.
 class Executor {
 public:
     // Starts `threadCount` workers; none when it is below 1, and then no node is ever run. With
@@ -58,11 +59,11 @@ public:
     Node& TakeNext() { return queue.TakeHighest(PickNext()); }
 
 private:
+    using Clock = std::chrono::steady_clock;
+
     static void* WorkerEntry(void* argument);
     void RunWorker();
-    // Returns whether it was woken soon: within about the time that falling asleep and waking up
-    // take.
-    bool SleepUntilWoken();
+    void LookOutForNodes(GlobalLockGuard& guard);
     void StartWorkers(std::int32_t threadCount);
     void StopWorkers();
 
@@ -77,6 +78,12 @@ private:
     // lock.
     bool someSleep = false;
     bool wakeUpOwed = false;
+    Clock::time_point lastFellAsleep;  // when a worker went to sleep last
+    // Whether the last node for which a worker had to wake others came soon after one of them had
+    // gone to sleep. How long those take to wake does not count: that may be many times as long.
+    // Nodes are taken to come soon until one has not, but where one worker has only itself to wait
+    // for.
+    bool nodesComeSoon;
     bool randomize;
 };
 

@@ -1,8 +1,12 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
+#include <signal.h>
+
 #include <atomic>
 #include <chrono>
+#include <initializer_list>
+#include <list>
 #include <thread>
 
 #include "graph/Executor.h"
@@ -115,66 +119,139 @@ TEST_F(SleeperTest, SleepersAreWokenOnceForABarrierAndWhatItMakesReady) {
     EXPECT_EQ(broadcastsUntilB, broadcasts + 1);
 }
 
-TEST_F(WakeUpTest, WorkerThatSleptLongSleepsAgainAtOnce) {
+TEST_F(WakeUpTest, SingleWorkerSleepsAgainAtOnce) {
     Faults().condWait.FailCall(1, 0);
-    Faults().condWait.Before([] { std::this_thread::sleep_for(std::chrono::milliseconds(1)); });
     const Executor executor(1, false);
     EXPECT_TRUE(WaitUntil([] { return Faults().condWait.Calls() >= 2; }));
     EXPECT_EQ(Faults().yield.Calls(), 0);
 }
 
-// Every wait ends at once: a worker sleeps briefly, again and again.
-class BriefSleepTest : public WakeUpTest {
+TEST_F(WakeUpTest, PluginDoesNotFindSigchldBlockedByTheSleepBefore) {
+    GraphText graph({"a"});
+    int isBlocked = -1;
+    graph["a"].onRun = [&] {
+        sigset_t mask;
+        pthread_sigmask(SIG_BLOCK, nullptr, &mask);
+        isBlocked = sigismember(&mask, SIGCHLD);
+    };
+    Executor executor(1, false);
+    EXPECT_TRUE(WaitUntil([] { return Faults().condWait.Calls() >= 1; }));
+    graph.Schedule(executor);
+    graph.WaitDone();
+    EXPECT_EQ(isBlocked, 0);
+}
+
+// Two workers. One runs "a" and then "b", which is queued `pause` after the other one has gone to
+// sleep; that one is woken for it in vain.
+class PaceTest : public WakeUpTest {
 protected:
-    BriefSleepTest() {
-        Faults().condWait.FailFrom(1, 0);
-        Faults().yield.Before([this] { GiveWay(); });
+    PaceTest() { EXPECT_TRUE(SleepsReach(workers)); }
+
+    // How often a worker gave way between being woken in vain and sleeping again.
+    int YieldsOfTheOther(std::chrono::microseconds pause) {
+        GraphText& graph =
+            graphs.emplace_back(std::initializer_list<const char*>{"a provides x", "b requires x"});
+        const int sleeps = Faults().condWait.Calls();
+        std::atomic<int> yields{0};
+        graph["a"].onRun = [&] {
+            EXPECT_TRUE(SleepsReach(sleeps + 1));
+            if (pause.count() > 0) {
+                std::this_thread::sleep_for(pause);
+            }
+            yields = Faults().yield.Calls();
+        };
+        graph["b"].onRun = [&] {
+            EXPECT_TRUE(SleepsReach(sleeps + 2));
+            yields = Faults().yield.Calls() - yields;
+        };
+        graph.Schedule(executor);
+        EXPECT_TRUE(SleepsReach(sleeps + 3));
+        return yields;
     }
 
-    // What a worker does that gives way. The first time it stays there until `resumed`.
-    void GiveWay() {
-        if (!givingWay) {
-            heldLock = GlobalLock::HeldByCurrentThread();
-            sleepsBefore = Faults().condWait.Calls();
-            givingWay = true;
-            EXPECT_TRUE(WaitUntil([this] { return resumed.load(); }));
+    // Watches without a pause, which would be one in the coming of the nodes.
+    static bool SleepsReach(int count) {
+        const auto end = std::chrono::steady_clock::now() + std::chrono::minutes(1);
+        while (Faults().condWait.Calls() < count) {
+            if (std::chrono::steady_clock::now() > end) {
+                return false;
+            }
         }
+        return true;
     }
 
+    static constexpr int workers = 2;
+    static constexpr std::chrono::milliseconds longTime{1};
+    std::list<GraphText> graphs;
+    Executor executor{workers, false};
+};
+
+TEST_F(PaceTest, WorkerWokenInVainSleepsAgainAtOnceWhereNodesTakeLong) {
+    EXPECT_EQ(YieldsOfTheOther(longTime), 0);
+}
+
+// How soon the node comes here is for the machine to say: it is tried until it was soon enough.
+TEST_F(PaceTest, WorkerWokenInVainGivesWayFirstWhereNodesComeSoonAgain) {
+    YieldsOfTheOther(longTime);
+    EXPECT_TRUE(WaitUntil([this] { return YieldsOfTheOther({}) > 0; }));
+}
+
+// Two workers that find no node and give way before they sleep, until `resumed`.
+class LookOutTest : public WakeUpTest {
+protected:
+    LookOutTest() {
+        Faults().yield.Before([this] {
+            heldLock = heldLock || GlobalLock::HeldByCurrentThread();
+            ++turns;
+            EXPECT_TRUE(WaitUntil([this] { return resumed.load(); }));
+        });
+    }
+
+    bool AllGiveWay() {
+        return WaitUntil([this] { return turns == workers; });
+    }
+
+    static constexpr int workers = 2;
     std::atomic<bool> heldLock{false};
-    std::atomic<int> sleepsBefore{0};
-    std::atomic<bool> givingWay{false};
+    std::atomic<int> turns{0};
     std::atomic<bool> resumed{false};
 };
 
-TEST_F(BriefSleepTest, WorkerThatGivesWayDoesNotHoldTheLock) {
-    const Executor executor(1, false);
-    EXPECT_TRUE(WaitUntil([&] { return givingWay.load(); }));
-    EXPECT_GT(sleepsBefore, 0);
+TEST_F(LookOutTest, WorkerThatGivesWayDoesNotHoldTheLock) {
+    const Executor executor(workers, false);
+    EXPECT_TRUE(AllGiveWay());
     EXPECT_FALSE(heldLock);
     resumed = true;
 }
 
-// The plugin is requested while nobody sleeps: no broadcast would wake the worker for it later.
-TEST_F(BriefSleepTest, WorkerThatGivesWayTakesWhatIsQueuedMeanwhileWithoutSleeping) {
-    GraphText graph({"a"});
-    std::atomic<int> sleepsUntilRun{-1};
-    graph["a"].onRun = [&] { sleepsUntilRun = Faults().condWait.Calls(); };
-    Executor executor(1, false);
-    EXPECT_TRUE(WaitUntil([&] { return givingWay.load(); }));
+// The plugins are requested while nobody sleeps: no broadcast would wake a worker for them later.
+TEST_F(LookOutTest, WorkersThatGiveWayTakeWhatIsQueuedMeanwhileWithoutSleeping) {
+    GraphText graph({"a", "b"});
+    std::atomic<int> started{0};
+    std::atomic<int> sleeps{0};
+    for (const char* const name : {"a", "b"}) {
+        graph[name].onRun = [&] {
+            sleeps += Faults().condWait.Calls();
+            ++started;
+            EXPECT_TRUE(WaitUntil([&] { return started == workers; }));
+        };
+    }
+    Executor executor(workers, false);
+    EXPECT_TRUE(AllGiveWay());
     graph.Schedule(executor);
     resumed = true;
-    EXPECT_TRUE(WaitUntil([&] { return graph["a"].State() == NodeState::Done; }));
-    EXPECT_EQ(sleepsUntilRun, sleepsBefore);
+    EXPECT_TRUE(WaitUntil([&] { return started == workers; }));
+    graph.WaitDone();
+    EXPECT_EQ(sleeps, 0);
 }
 
-TEST_F(BriefSleepTest, WorkerThatGivesWayWhileThePoolStopsLeavesWithoutSleeping) {
+TEST_F(LookOutTest, WorkersThatGiveWayWhileThePoolStopsLeaveWithoutSleeping) {
     Faults().threadJoin.Before([&] { resumed = true; });
     {
-        const Executor executor(1, false);
-        EXPECT_TRUE(WaitUntil([&] { return givingWay.load(); }));
+        const Executor executor(workers, false);
+        EXPECT_TRUE(AllGiveWay());
     }
-    EXPECT_EQ(Faults().condWait.Calls(), sleepsBefore);
+    EXPECT_EQ(Faults().condWait.Calls(), 0);
 }
 
 }  // namespace
