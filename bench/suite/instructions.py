@@ -69,25 +69,40 @@ def _json(host, results, folder):
                         ("nlohmann-json", theirs))
 
 
-def _loading(host, results, count):
+def _native_plugins(host, results, count, empty):
     host.clear_plugins()
-    results.progress.say(f"{GROUP}: whole boots")
-    empty = _count_whole(host, VANTOR)
     bare_empty = _count_whole(host, "/usr/bin/bare-loading", PLUGINS, "0")
-    results.figure(GROUP, "boot of an empty directory", "vantor", [empty], "a run")
     lay_out_plugins(host, count)
     ours = (_count_whole(host, VANTOR) - empty) / count
     theirs = (_count_whole(host, "/usr/bin/bare-loading", PLUGINS, str(count)) - bare_empty) / count
     results.compare(GROUP, f"{count} native plugins, loaded and run", "per plugin",
                     ("vantor", [ours]), ("bare dlopen loop", [theirs]))
     host.clear_plugins()
-    host.root.debug_configuration(*(f"p{number}: : :true" for number in range(count)))
-    results.figure(GROUP, f"{count} debug plugins, loaded and run", "vantor",
-                   [(_count_whole(host, VANTOR) - empty) / count], "per plugin")
+
+
+def _debug_plugins(host, results, counts, empty):
+    """All names are of one length, so that both sizes have the same to do for each."""
+    taken = []
+    for count in counts:
+        results.progress.say(f"{GROUP}: boot of {count:,} debug plugins")
+        host.root.debug_configuration(*(f"p{number:04}: : :true" for number in range(count)))
+        taken.append((_count_whole(host, VANTOR) - empty) / count)
     host.clear_plugins()
+    results.compare(GROUP, "debug plugins, loaded and run", "per plugin",
+                    (f"vantor, {counts[1]:,}", taken[1:]), (f"vantor, {counts[0]:,}", taken[:1]),
+                    1.01)
+
+
+def _boots(host, results, native, debug):
+    host.clear_plugins()
+    results.progress.say(f"{GROUP}: whole boots")
+    empty = _count_whole(host, VANTOR)
+    results.figure(GROUP, "boot of an empty directory", "vantor", [empty], "a run")
+    _native_plugins(host, results, native, empty)
+    _debug_plugins(host, results, debug, empty)
 
 
 def measure(host, results, folder):
     _graph(host, results, 1000 if results.quick else 10000)
     _json(host, results, folder)
-    _loading(host, results, 20 if results.quick else 200)
+    _boots(host, results, 20 if results.quick else 200, [20, 100] if results.quick else [1000, 5000])
