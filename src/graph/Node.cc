@@ -22,7 +22,8 @@ void Remove(Node::Edges& edges, const Node* node) {
 
 }  // namespace
 
-std::atomic<std::int32_t> Node::unfinished{0};
+std::int32_t Node::unfinished = 0;
+Node::Flag Node::allFinished{true};
 
 Node::Node(std::string nodeName) : name(std::move(nodeName)) {
     if (pthread_cond_init(&doneCondition, nullptr) != 0) {
@@ -88,12 +89,17 @@ void Node::ScheduleLocked(Executor& executor) {
 }
 
 void Node::CountUnfinished(std::int32_t step) {
-    unfinished.store(unfinished.load(std::memory_order_relaxed) + step, std::memory_order_relaxed);
+    if (unfinished == 0) {
+        allFinished.value.store(false, std::memory_order_relaxed);
+    }
+    unfinished += step;
+    if (unfinished == 0) {
+        allFinished.value.store(true, std::memory_order_relaxed);
+    }
 }
 
 // A graph of short nodes is done before this thread would have fallen asleep and been woken. Other
-// threads may have the processor meanwhile; and between two looks is a pause, as each look takes
-// the count away from the processor that changes it.
+// threads may have the processor meanwhile, a sibling on the same core too.
 void Node::LookOutForTheEnd() {
     using Clock = std::chrono::steady_clock;
     constexpr std::chrono::microseconds patience{200};
@@ -203,19 +209,18 @@ std::int32_t Node::Height() {
 
 // Depth first. While a node is under way its height is that of the highest dependent seen so far,
 // and 0 before there is one; a dependent that is under way itself closes a cycle. The way back lies
-// in the nodes: beside them it would be copied again and again while it grows. No node of unknown
-// height has another one behind it in the ready queue, so that `next` is free, and null.
+// in the nodes: beside them it would be copied again and again while it grows.
 void Node::ComputeHeight() {
     height = 0;
     for (Node* node = this; node != nullptr;) {
         if (Node* const unknown = node->NextWithoutHeight()) {
             unknown->height = 0;
-            unknown->next = node;
+            unknown->heightIsFor = node;
             node = unknown;
         } else {
             ++node->height;
             node->heightKnown = true;
-            node = node->next;
+            node = node->heightIsFor;
         }
     }
 }

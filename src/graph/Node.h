@@ -121,10 +121,11 @@ public:
     std::int32_t Height();
 
 private:
-    friend class ReadyQueue;  // chains the nodes that are ready through `next`
+    // Chains the nodes that are ready through `next`, and sees which the same ones wait for.
+    friend class ReadyQueue;
 
     // These take no lock and need none.
-    static bool AnyUnfinished() { return unfinished.load(std::memory_order_relaxed) != 0; }
+    static bool AnyUnfinished() { return !allFinished.value.load(std::memory_order_relaxed); }
     static void LookOutForTheEnd();
 
     // The caller of any of these holds the lock; ReleaseAndWake() gives it up.
@@ -148,9 +149,14 @@ private:
     Node* NextWithoutHeight();
 
     // So many nodes have been requested and are neither done nor destroyed, of all executors
-    // together. Written only with the lock held and read without it by LookOutForTheEnd(): hence
-    // atomic.
-    static std::atomic<std::int32_t> unfinished;
+    // together; and whether that is none. Both are written with the lock held. LookOutForTheEnd()
+    // reads the second one without it, which is therefore atomic, and alone in its cache line: the
+    // workers write there once a run and not at each node.
+    struct alignas(64) Flag {
+        std::atomic<bool> value;
+    };
+    static std::int32_t unfinished;
+    static Flag allFinished;
 
     bool heightKnown = false;
     std::int32_t height = -1;
@@ -161,12 +167,11 @@ private:
     std::uint32_t settled = 0;
     // While its height is being found: so many of its dependents have been looked at.
     std::uint32_t heightsSeen = 0;
-    // While its height is being found: the node whose height that is for. Once it is queued: the
-    // one behind it in its row of the ready queue.
-    Node* next = nullptr;
+    Node* next = nullptr;  // once it is queued: the one behind it in its row of the ready queue
     std::string name;
     Edges dependencies;
     Edges dependents;
+    Node* heightIsFor = nullptr;  // while its height is being found: the node whose height needs it
     pthread_cond_t doneCondition;  // broadcast when the node becomes done through Execute()
 };
 

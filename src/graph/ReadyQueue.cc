@@ -6,8 +6,9 @@
 
 namespace vantor {
 
-// A node that is alone is the one to take, however high it is. In a chain of plugins, where nothing
-// is ever to be chosen, no height is ever computed.
+// A node that is alone is the one to take, however high it is; and nodes that the same ones wait
+// for are equally high, however high that is. In a chain of plugins, and in layers of them with a
+// barrier between any two, no height is ever computed.
 void ReadyQueue::Push(Node& node) {
     if (Empty()) {
         highestHeight = 0;
@@ -15,6 +16,10 @@ void ReadyQueue::Push(Node& node) {
         return;
     }
     if (highestHeight == 0) {
+        if (node.dependents == highest.first->dependents) {
+            Append(highest, node);
+            return;
+        }
         highestHeight = highest.first->HeightLocked();
     }
     const std::int32_t height = node.HeightLocked();

@@ -21,7 +21,7 @@ public:
     bool Empty() const { return highest.count == 0; }
 
     // Puts a node at the end of the row of its height, which is computed if it is not known yet:
-    // not before there are two nodes to choose from. Logarithmic in the number of rows.
+    // not before two nodes in the queue may differ in height. Logarithmic in the number of rows.
     void Push(Node& node);
 
     // The number of nodes in the highest row. The queue is not empty.
@@ -45,7 +45,7 @@ private:
     static void Append(Row& row, Node& node);
 
     // The highest row stands apart: in chains and layers it is the only one.
-    std::int32_t highestHeight = 0;  // 0 while nobody has asked for it: its one node stands alone
+    std::int32_t highestHeight = 0;  // 0 while nobody has asked for it: there is no other row
     Row highest;                     // empty only when the queue is
     Rows lower;                      // the others, none of them empty
     Rows::node_type spare;  // of the row that left `lower` last, for the next one that comes

@@ -164,6 +164,44 @@ TEST_F(ReadyQueueTest, HeightOfANodeThatIsAloneIsNotAskedFor) {
     EXPECT_EQ(alone.Height(), 4);
 }
 
+TEST_F(ReadyQueueTest, HeightOfNodesThatTheSameOnesWaitForIsNotAskedFor) {
+    TestNode& first = nodes.OfHeight(2);
+    TestNode& second = nodes.OfHeight(2);
+    Push({&first, &second});
+    EXPECT_EQ(queue.HighestCount(), 2U);
+    for (TestNode* const node : {&first, &second}) {
+        node->AddDependent(nodes.OfHeight(3));
+        EXPECT_EQ(node->Height(), 4);
+    }
+}
+
+TEST_F(ReadyQueueTest, NodesThatTheSameOnesWaitForAreComparedWithTheNext) {
+    TestNode& first = nodes.OfHeight(2);
+    TestNode& second = nodes.OfHeight(2);
+    TestNode& high = nodes.OfHeight(3);
+    Push({&first, &second, &high});
+    EXPECT_EQ(queue.HighestCount(), 1U);
+    EXPECT_EQ(&queue.TakeHighest(0), &high);
+    EXPECT_EQ(&queue.TakeHighest(0), &first);
+    EXPECT_EQ(&queue.TakeHighest(0), &second);
+}
+
+// As where a plugin between them was declared done without running: then both ends may be ready.
+TEST_F(ReadyQueueTest, NodesStayInTheirOrderWhenTheHeightOfOneAboveThemIsAskedFor) {
+    TestNode& first = nodes.OfHeight(2);
+    TestNode& second = nodes.OfHeight(2);
+    TestNode& third = nodes.OfHeight(2);
+    TestNode& above = nodes.OfHeight(1);
+    for (TestNode* const node : {&third, &second, &first}) {
+        above.AddDependent(*node);
+    }
+    Push({&first, &second, &third, &above});
+    EXPECT_EQ(&queue.TakeHighest(0), &above);
+    EXPECT_EQ(&queue.TakeHighest(0), &first);
+    EXPECT_EQ(&queue.TakeHighest(0), &second);
+    EXPECT_EQ(&queue.TakeHighest(0), &third);
+}
+
 // Nobody has asked any of them for its height before.
 TEST_F(ReadyQueueTest, NodesOfUnknownHeightLeaveHighestAndOldestFirst) {
     std::mt19937 random(20261123);
