@@ -70,7 +70,6 @@ def _json(host, results, folder):
 
 
 def _native_plugins(host, results, count, empty):
-    host.clear_plugins()
     bare_empty = _count_whole(host, "/usr/bin/bare-loading", PLUGINS, "0")
     lay_out_plugins(host, count)
     ours = (_count_whole(host, VANTOR) - empty) / count

@@ -233,12 +233,12 @@ TEST_F(SigchldTest, StaysBlockedWhereItWasBefore) {
     EXPECT_TRUE(IsBlocked());
 }
 
-int handled = 0;
+volatile std::sig_atomic_t handled = 0;
 
 TEST_F(SigchldTest, IsDeliveredAfterTheWait) {
     handled = 0;
-    const auto oldHandler = std::signal(SIGCHLD, [](int) { ++handled; });
-    int handledMeanwhile = -1;
+    const auto oldHandler = std::signal(SIGCHLD, [](int) { handled = handled + 1; });
+    std::sig_atomic_t handledMeanwhile = -1;
     Faults().condWait.Before([&] {
         pthread_kill(pthread_self(), SIGCHLD);
         handledMeanwhile = handled;

@@ -92,6 +92,13 @@ protected:
         }
     }
 
+    // Takes the highest and oldest, again and again, and expects these.
+    void ExpectTaken(std::initializer_list<Node*> taken) {
+        for (Node* node : taken) {
+            EXPECT_EQ(&queue.TakeHighest(0), node) << node->Name();
+        }
+    }
+
     // Pushes and takes nodes of heights from 1 to the greatest, all at random, and expects each
     // choice to be that of a plain scan, with a draw among the highest.
     void CompareWithPlainScan(std::size_t nodeCount, int greatestHeight, int stepCount);
@@ -115,9 +122,7 @@ TEST_F(ReadyQueueTest, EqualsLeaveInTheOrderInWhichTheyCame) {
     TestNode& second = nodes.OfHeight(3);
     TestNode& third = nodes.OfHeight(3);
     Push({&first, &second, &third});
-    EXPECT_EQ(&queue.TakeHighest(0), &first);
-    EXPECT_EQ(&queue.TakeHighest(0), &second);
-    EXPECT_EQ(&queue.TakeHighest(0), &third);
+    ExpectTaken({&first, &second, &third});
 }
 
 TEST_F(ReadyQueueTest, AHigherNodeThatCameLaterLeavesFirst) {
@@ -125,9 +130,7 @@ TEST_F(ReadyQueueTest, AHigherNodeThatCameLaterLeavesFirst) {
     TestNode& high = nodes.OfHeight(9);
     TestNode& middle = nodes.OfHeight(4);
     Push({&low, &high, &middle});
-    EXPECT_EQ(&queue.TakeHighest(0), &high);
-    EXPECT_EQ(&queue.TakeHighest(0), &middle);
-    EXPECT_EQ(&queue.TakeHighest(0), &low);
+    ExpectTaken({&high, &middle, &low});
 }
 
 TEST_F(ReadyQueueTest, OnlyTheHighestAreCounted) {
@@ -141,8 +144,7 @@ TEST_F(ReadyQueueTest, OneFromTheMiddleLeavesTheOthersInTheirOrder) {
     TestNode& third = nodes.OfHeight(2);
     Push({&first, &second, &third});
     EXPECT_EQ(&queue.TakeHighest(1), &second);
-    EXPECT_EQ(&queue.TakeHighest(0), &first);
-    EXPECT_EQ(&queue.TakeHighest(0), &third);
+    ExpectTaken({&first, &third});
 }
 
 TEST_F(ReadyQueueTest, WhoComesAfterTheLastWasTakenStandsAtTheEnd) {
@@ -152,8 +154,7 @@ TEST_F(ReadyQueueTest, WhoComesAfterTheLastWasTakenStandsAtTheEnd) {
     Push({&first, &last});
     EXPECT_EQ(&queue.TakeHighest(1), &last);
     queue.Push(later);
-    EXPECT_EQ(&queue.TakeHighest(0), &first);
-    EXPECT_EQ(&queue.TakeHighest(0), &later);
+    ExpectTaken({&first, &later});
 }
 
 // Its height is computed when it is asked for, and kept from then on.
@@ -181,9 +182,7 @@ TEST_F(ReadyQueueTest, NodesThatTheSameOnesWaitForAreComparedWithTheNext) {
     TestNode& high = nodes.OfHeight(3);
     Push({&first, &second, &high});
     EXPECT_EQ(queue.HighestCount(), 1U);
-    EXPECT_EQ(&queue.TakeHighest(0), &high);
-    EXPECT_EQ(&queue.TakeHighest(0), &first);
-    EXPECT_EQ(&queue.TakeHighest(0), &second);
+    ExpectTaken({&high, &first, &second});
 }
 
 // As where a plugin between them was declared done without running: then both ends may be ready.
@@ -196,10 +195,7 @@ TEST_F(ReadyQueueTest, NodesStayInTheirOrderWhenTheHeightOfOneAboveThemIsAskedFo
         above.AddDependent(*node);
     }
     Push({&first, &second, &third, &above});
-    EXPECT_EQ(&queue.TakeHighest(0), &above);
-    EXPECT_EQ(&queue.TakeHighest(0), &first);
-    EXPECT_EQ(&queue.TakeHighest(0), &second);
-    EXPECT_EQ(&queue.TakeHighest(0), &third);
+    ExpectTaken({&above, &first, &second, &third});
 }
 
 // Nobody has asked any of them for its height before.
@@ -231,8 +227,7 @@ TEST_F(ReadyQueueTest, NodeThatWasAloneIsComparedWithTheNext) {
     TestNode& high = nodes.OfHeight(3);
     Push({&low, &high});
     EXPECT_EQ(queue.HighestCount(), 1U);
-    EXPECT_EQ(&queue.TakeHighest(0), &high);
-    EXPECT_EQ(&queue.TakeHighest(0), &low);
+    ExpectTaken({&high, &low});
 }
 
 void ReadyQueueTest::CompareWithPlainScan(std::size_t nodeCount, int greatestHeight,
