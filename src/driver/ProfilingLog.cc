@@ -28,20 +28,53 @@ void AppendPadded(std::string& text, std::int64_t value, std::size_t width) {
     text.append(std::max(width, count) - count, '0').append(digits.data(), count);
 }
 
+// The text of a time. Few of a boot's times lie in another second than the one before: only for
+// those the calendar is asked.
+class TimeText {
+public:
+    void AppendTo(std::string& text, const timeval& time) {
+        if (beginning.empty() || time.tv_sec != second) {
+            second = time.tv_sec;
+            beginning = Beginning(second);
+        }
+        AppendPadded(text += beginning, time.tv_usec, 6);
+    }
+
+private:
+    // All of it that is the same within a second.
+    static std::string Beginning(std::time_t second) {
+        std::tm utc{};
+        gmtime_r(&second, &utc);
+        std::string text;
+        AppendPadded(text, utc.tm_year + std::int64_t{1900}, 4);
+        AppendPadded(text += '-', utc.tm_mon + 1, 2);
+        AppendPadded(text += '-', utc.tm_mday, 2);
+        AppendPadded(text += ' ', utc.tm_hour, 2);
+        AppendPadded(text += ':', utc.tm_min, 2);
+        AppendPadded(text += ':', utc.tm_sec, 2);
+        return text += '.';
+    }
+
+    std::time_t second = 0;
+    std::string beginning;  // that of `second`; empty before the first time
+};
+
+void WriteSpans(std::ostream& stream, const PluginQueue& nodes) {
+    TimeText time;
+    std::string line;
+    for (const Plugin* node : nodes) {
+        line = '[';
+        time.AppendTo(line, node->StartTime());
+        time.AppendTo(line += " - ", node->EndTime());
+        stream << (line += "] sysboot: ").append(node->Name()) << '\n';
+    }
+}
+
 }  // namespace
 
 std::ostream& FormatTime(std::ostream& stream, const timeval& time) {
-    std::tm utc{};
-    const std::time_t seconds = time.tv_sec;
-    gmtime_r(&seconds, &utc);
     std::string text;
-    AppendPadded(text, utc.tm_year + std::int64_t{1900}, 4);
-    AppendPadded(text += '-', utc.tm_mon + 1, 2);
-    AppendPadded(text += '-', utc.tm_mday, 2);
-    AppendPadded(text += ' ', utc.tm_hour, 2);
-    AppendPadded(text += ':', utc.tm_min, 2);
-    AppendPadded(text += ':', utc.tm_sec, 2);
-    AppendPadded(text += '.', time.tv_usec, 6);
+    TimeText().AppendTo(text, time);
     stream.fill('0');
     stream.width(0);
     return stream << text;
@@ -51,10 +84,7 @@ void FormatProfilingLog(std::ostream& stream, const timeval& startTime, const ti
                         std::uint64_t uptimeSeconds, const PluginQueue& nodes,
                         const RunConfig& config) {
     stream << "NVKernel Initialization Time: " << uptimeSeconds * 1000000U << '\n';
-    for (const Plugin* node : nodes) {
-        FormatTime(stream << '[', node->StartTime());
-        FormatTime(stream << " - ", node->EndTime()) << "] sysboot: " << node->Name() << '\n';
-    }
+    WriteSpans(stream, nodes);
     stream << "=== Vantor configuration info ===\n";
     FormatTime(stream << " Start: ", startTime) << '\n';
     FormatTime(stream << " End: ", endTime) << '\n';

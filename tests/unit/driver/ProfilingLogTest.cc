@@ -22,6 +22,7 @@ namespace {
 
 using support::LogEntry;
 using ::testing::ElementsAre;
+using ::testing::HasSubstr;
 using ::testing::IsEmpty;
 using ::testing::MatchesRegex;
 
@@ -143,6 +144,18 @@ TEST_F(ProfilingLogTest, EveryNodeHasALineInNodeOrder) {
                       " Randomize: 0\n"
                       " Interactive Mode: 0\n"
                       " Random Seed: 0\n");
+}
+
+TEST_F(ProfilingLogTest, EachTimeIsItsOwnInWhicheverSecondTheOneBeforeLies) {
+    support::FakePlugin first("first");
+    support::FakePlugin second("second");
+    AddNode(first, {0, 5}, {0, 123456});
+    AddNode(second, {86400, 6}, {0, 7});
+    const std::string text = Text();
+    EXPECT_THAT(text, HasSubstr("\n[1970-01-01 00:00:00.000005 - 1970-01-01 00:00:00.123456] "
+                                "sysboot: first\n"
+                                "[1970-01-02 00:00:00.000006 - 1970-01-01 00:00:00.000007] "
+                                "sysboot: second\n"));
 }
 
 TEST_F(ProfilingLogTest, FlagsAreWrittenAsNumbers) {
