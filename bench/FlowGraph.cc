@@ -1,15 +1,13 @@
 #include "FlowGraph.h"
 
 #include <tbb/flow_graph.h>
-#include <tbb/task_group.h>
 
 #include <atomic>
-#include <chrono>
 #include <deque>
 #include <stdexcept>
-#include <thread>
 #include <vector>
 
+#include "Gathering.h"
 #include "MeasuredPart.h"
 
 namespace vantor::bench {
@@ -19,8 +17,26 @@ namespace {
 using Message = tbb::flow::continue_msg;
 using FlowNode = tbb::flow::continue_node<Message>;
 
+// oneTBB starts a thread when there is first something for it to do: here, to wait for the others.
+void Gather(int workers) {
+    Gathering gathering(workers);
+    tbb::flow::graph graph;
+    std::deque<FlowNode> nodes;
+    for (int i = 0; i < workers; ++i) {
+        nodes.emplace_back(graph, [&gathering](const Message& message) {
+            gathering.Arrive();
+            return message;
+        });
+    }
+    for (FlowNode& node : nodes) {
+        node.try_put(Message());
+    }
+    graph.wait_for_all();
+    gathering.RequireAll();
+}
+
 template <typename Body>
-double RunWith(const GraphShape& shape, const Body& body) {
+double RunWith(const GraphShape& shape, int workers, const Body& body) {
     tbb::flow::graph graph;
     std::deque<FlowNode> nodes;
     for (std::size_t i = 0; i < shape.count; ++i) {
@@ -37,6 +53,7 @@ double RunWith(const GraphShape& shape, const Body& body) {
             first.push_back(&nodes[i]);
         }
     }
+    Gather(workers);
     return MeasuredSeconds([&] {
         for (FlowNode* node : first) {
             node->try_put(Message());
@@ -45,44 +62,22 @@ double RunWith(const GraphShape& shape, const Body& body) {
     });
 }
 
-// oneTBB starts a thread when there is first something for it to do: here, to wait for the others.
-void StartThreads(tbb::task_arena& arena, int workers) {
-    using Clock = std::chrono::steady_clock;
-    const auto end = Clock::now() + std::chrono::seconds(10);
-    std::atomic<int> present{0};
-    arena.execute([&] {
-        tbb::task_group threads;
-        for (int i = 0; i < workers; ++i) {
-            threads.run([&] {
-                for (++present; present < workers && Clock::now() < end;) {
-                    std::this_thread::yield();
-                }
-            });
-        }
-        threads.wait();
-    });
-    if (Clock::now() >= end) {
-        throw std::runtime_error("oneTBB did not start all its threads");
-    }
-}
-
 }  // namespace
 
-FlowGraph::FlowGraph(int workers)
-    : limit(tbb::global_control::max_allowed_parallelism, static_cast<std::size_t>(workers)),
-      arena(workers) {
-    StartThreads(arena, workers);
-}
+FlowGraph::FlowGraph(int workerCount)
+    : workers(workerCount),
+      limit(tbb::global_control::max_allowed_parallelism, static_cast<std::size_t>(workerCount)),
+      arena(workerCount) {}
 
 double FlowGraph::Run(const GraphShape& shape) {
     return arena.execute(
-        [&] { return RunWith(shape, [](const Message& message) { return message; }); });
+        [&] { return RunWith(shape, workers, [](const Message& message) { return message; }); });
 }
 
 double FlowGraph::RunCounted(const GraphShape& shape) {
     std::atomic<std::size_t> bodies{0};
     const double taken = arena.execute([&] {
-        return RunWith(shape, [&bodies](const Message& message) {
+        return RunWith(shape, workers, [&bodies](const Message& message) {
             ++bodies;
             return message;
         });

@@ -8,8 +8,9 @@
 //     schedule/far/nodes:N/...                    or from its last one
 //     height/nodes:N/...                          of the first node of a chain
 //
-// Each graph is built, and the workers are started, outside of the time that is measured. A boot is
-// only what its process does first and alone:
+// Each graph is built, and then the workers are started, outside of the time that is measured. They
+// wait for one another before it begins: all of them are awake then. A boot is only what its
+// process does first and alone:
 //
 //     bench-graph --benchmark_filter=^boot/vantor/chain/nodes:1000/workers:1/
 
@@ -20,11 +21,13 @@
 #include <cstdint>
 #include <cstdlib>
 #include <deque>
+#include <optional>
 #include <stdexcept>
 #include <string>
 #include <vector>
 
 #include "FlowGraph.h"
+#include "Gathering.h"
 #include "GraphShapes.h"
 #include "GuardedBenchmarks.h"
 #include "MeasuredPart.h"
@@ -49,6 +52,26 @@ public:
     void Run() override { ++nodesRun; }
 };
 
+class ArrivingNode : public EmptyNode {
+public:
+    explicit ArrivingNode(Gathering& place) : gathering(place) {}
+    void Run() override { gathering.Arrive(); }
+
+private:
+    Gathering& gathering;
+};
+
+// The pointers to all of them, as the driver keeps its plugins.
+template <typename Kind>
+std::vector<Node*> SequenceOf(std::deque<Kind>& nodes) {
+    std::vector<Node*> sequence;
+    sequence.reserve(nodes.size());
+    for (Node& node : nodes) {
+        sequence.push_back(&node);
+    }
+    return sequence;
+}
+
 template <typename Kind>
 std::deque<Kind> Build(const GraphShape& shape) {
     std::deque<Kind> nodes(shape.count);
@@ -61,7 +84,7 @@ std::deque<Kind> Build(const GraphShape& shape) {
 // Vantor's side of the comparison; the other one is FlowGraph.
 class OwnGraph {
 public:
-    explicit OwnGraph(int workers) : executor(workers, false) {}
+    explicit OwnGraph(int workerCount) : workers(workerCount) {}
 
     double Run(const GraphShape& shape) { return RunNodes<EmptyNode>(shape); }
 
@@ -75,19 +98,31 @@ public:
     }
 
 private:
-    // As the driver does it: every node is requested in order, and then waited for.
+    // As the driver does it: no worker exists before the graph is complete. Then every node is
+    // requested in order, and waited for.
     template <typename Kind>
     double RunNodes(const GraphShape& shape) {
         auto nodes = Build<Kind>(shape);
-        std::vector<Node*> sequence;
-        sequence.reserve(nodes.size());
-        for (Node& node : nodes) {
-            sequence.push_back(&node);
+        const auto sequence = SequenceOf(nodes);
+        if (!executor) {
+            executor.emplace(workers, false);
         }
-        return MeasuredSeconds([&] { Node::RunAll(sequence, executor); });
+        Gather();
+        return MeasuredSeconds([&] { Node::RunAll(sequence, *executor); });
     }
 
-    Executor executor;
+    void Gather() {
+        Gathering gathering(workers);
+        std::deque<ArrivingNode> nodes;
+        for (int i = 0; i < workers; ++i) {
+            nodes.emplace_back(gathering);
+        }
+        Node::RunAll(SequenceOf(nodes), *executor);
+        gathering.RequireAll();
+    }
+
+    int workers;
+    std::optional<Executor> executor;  // from the first run on
 };
 
 std::size_t NodeCount(const benchmark::State& state) {

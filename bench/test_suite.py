@@ -84,10 +84,10 @@ def test_a_ratio_is_the_median_over_the_rounds():
 
 
 def test_what_is_to_stay_the_same_has_grown_only_when_chance_is_not_enough():
-    steady = Row("group", "work", "ours", 3, "us", "ours", 2, [0.9, 1.0, 1.1, 1.2], limit=1.0,
+    steady = Row("group", "work", "ours", 3, "us", "ours", 2, [1.0, 1.1, 1.1, 1.2], limit=1.0,
                  growth=True)
     assert steady.ratio > 1 and steady.verdict == "kept"
-    grown = Row("group", "work", "ours", 3, "us", "ours", 2, [1.0, 1.1, 1.1, 1.2], limit=1.0,
+    grown = Row("group", "work", "ours", 3, "us", "ours", 2, [1.01, 1.1, 1.1, 1.2], limit=1.0,
                 growth=True)
     assert grown.verdict == "missed"
 

@@ -17,7 +17,7 @@ class Row:
     ratios  ours divided by the other, one for each round
     limit   what the ratio is to stay at or below; None where nothing is asked
     growth  both figures are ours, at two sizes, and are to be the same: equal ones differ by chance,
-            so that only a ratio beyond the limit in three quarters of the rounds is a growth
+            so that only a ratio beyond the limit in every round is a growth
     """
 
     group: str
@@ -46,7 +46,7 @@ class Row:
     def verdict(self):
         if self.limit is None or not self.ratios:
             return ""
-        counts = self.quartiles[0] if self.growth else self.ratio
+        counts = min(self.ratios) if self.growth else self.ratio
         return "kept" if counts <= self.limit else "missed"
 
 

@@ -26,8 +26,7 @@ constexpr std::chrono::microseconds soon{50};
 
 }  // namespace
 
-Executor::Executor(std::int32_t threadCount, bool randomizeEquals)
-    : nodesComeSoon(threadCount > 1), randomize(randomizeEquals) {
+Executor::Executor(std::int32_t threadCount, bool randomizeEquals) : randomize(randomizeEquals) {
     if (pthread_cond_init(&workAvailable, nullptr) != 0) {
         throw Exception("Condition variable for Executor could not be initialized");
     }
@@ -117,19 +116,17 @@ void Executor::RunWorker() {
     }
 }
 
-// Every node that is queued wakes all idle workers, and mostly all but one in vain. Where one short
-// node follows the other, a worker that went back to sleep at once would be there to be woken for
-// the very next one, at many times the cost of the node. So it looks again a few times before, and
-// lets others have the processor in between. Where nodes take long, that would only take processor
-// time from them.
+// A worker that has just been started looks here for what is requested at that moment, and so need
+// not be woken for it. Later, every node that is queued wakes all idle workers, and mostly all but
+// one in vain: where one short node follows the other, a worker that went back to sleep at once
+// would be there to be woken for the very next one, at many times the cost of the node. So it looks
+// again a few times before, and lets others have the processor in between. Where nodes take long,
+// that would only take processor time from them.
 void Executor::LookOutForNodes(GlobalLockGuard& guard) {
-    constexpr int looks = 10;
-    constexpr int turns = 3;
+    constexpr int looks = 30;
     for (int i = 0; i < looks && nodesComeSoon && !HasReady() && !stopping; ++i) {
         guard.Release();
-        for (int turn = 0; turn < turns; ++turn) {
-            sched_yield();
-        }
+        sched_yield();
         guard.Retake();
     }
 }

@@ -81,9 +81,8 @@ private:
     Clock::time_point lastFellAsleep;  // when a worker went to sleep last
     // Whether the last node for which a worker had to wake others came soon after one of them had
     // gone to sleep. How long those take to wake does not count: that may be many times as long.
-    // Nodes are taken to come soon until one has not, but where one worker has only itself to wait
-    // for.
-    bool nodesComeSoon;
+    // Nodes are taken to come soon until one has not: the first ones follow the construction.
+    bool nodesComeSoon = true;
     bool randomize;
 };
 

@@ -99,11 +99,13 @@ void Node::CountUnfinished(std::int32_t step) {
 }
 
 // A graph of short nodes is done before this thread would have fallen asleep and been woken. Other
-// threads may have the processor meanwhile, a sibling on the same core too.
+// threads may have the processor meanwhile, a sibling on the same core too. The pause is a short
+// one: where the worker shares this processor, it waits for the end of the pause at each of its own
+// turns.
 void Node::LookOutForTheEnd() {
     using Clock = std::chrono::steady_clock;
     constexpr std::chrono::microseconds patience{200};
-    constexpr int pause = 128;
+    constexpr int pause = 8;
     const auto end = Clock::now() + patience;
     do {
         sched_yield();
