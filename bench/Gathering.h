@@ -8,13 +8,13 @@
 
 namespace vantor::bench {
 
-// Where threads wait for one another, so that all of them have begun and are awake when what is
-// measured begins. Each arrives from a node of its own.
+// Where threads wait for one another, so that all of them have begun and none sleeps yet when what
+// is measured begins. Each arrives from a node of its own.
 class Gathering {
 public:
     explicit Gathering(int threadCount) : expected(threadCount) {}
 
-    // Returns when all have arrived, or after ten seconds; others may have the processor meanwhile.
+    // Returns when all have arrived, or after ten seconds; gives way to other threads meanwhile.
     void Arrive() {
         for (++arrived; arrived < expected && Clock::now() < end;) {
             std::this_thread::yield();

@@ -4,13 +4,14 @@
 //     boot/PROGRAM/SHAPE/nodes:N/workers:W/...    one graph, by threads that have just begun
 //     again/PROGRAM/SHAPE/nodes:N/workers:W/...   many graphs, one after the other; the median
 //     check/PROGRAM/SHAPE/nodes:N/workers:W/...   one graph, whose nodes count themselves
+//     life/SHAPE/nodes:N/workers:W/...            one graph of vantor's, and its executor's threads
 //     schedule/near/nodes:N/...                   requesting a chain from its first node,
 //     schedule/far/nodes:N/...                    or from its last one
 //     height/nodes:N/...                          of the first node of a chain
 //
-// Each graph is built, and then the workers are started, outside of the time that is measured. They
-// wait for one another before it begins: all of them are awake then. A boot is only what its
-// process does first and alone:
+// Each graph is built, and then the workers are started, outside of the time that is measured, but
+// for a life, whose time they belong to. Before it begins they run a node each and wait for one
+// another there, so that none sleeps yet. A boot or a life is to be all that its process measures:
 //
 //     bench-graph --benchmark_filter=^boot/vantor/chain/nodes:1000/workers:1/
 
@@ -153,6 +154,17 @@ void Check(benchmark::State& state, const std::string& kind) {
     }
 }
 
+void Live(benchmark::State& state, const std::string& kind) {
+    auto nodes = Build<EmptyNode>(MakeShape(kind, NodeCount(state)));
+    const auto sequence = SequenceOf(nodes);
+    while (state.KeepRunning()) {
+        state.SetIterationTime(MeasuredSeconds([&] {
+            Executor executor(WorkerCount(state), false);
+            Node::RunAll(sequence, executor);
+        }));
+    }
+}
+
 void Require(bool holds, const char* otherwise) {
     if (!holds) {
         throw std::runtime_error(otherwise);
@@ -230,9 +242,15 @@ void RegisterRuns(const std::string& program, const std::string& kind) {
 }
 
 void RegisterAll() {
-    for (const char* const kind : {"independent", "layered", "chain"}) {
+    for (const char* const kind : {"independent", "layered", "chain", "mixed"}) {
         RegisterRuns<OwnGraph>("vantor", kind);
         RegisterRuns<FlowGraph>("flow", kind);
+    }
+    for (const int workers : {1, 8}) {
+        Register("life/chain", &Live, std::string("chain"))
+            ->ArgNames({"nodes", "workers"})
+            ->Args({smallest, workers})
+            ->Iterations(1);
     }
     for (std::int64_t count = smallest; count <= largest; count *= sizeStep) {
         for (auto* const chain :

@@ -1,6 +1,7 @@
 #include "GraphShapes.h"
 
 #include <algorithm>
+#include <random>
 #include <stdexcept>
 
 namespace vantor::bench {
@@ -22,6 +23,21 @@ void AddLayers(GraphShape& shape) {
     }
 }
 
+// Chains side by side, of 1 to 100 nodes each, drawn from a fixed seed: nodes of many heights are
+// ready together.
+void AddMixedChains(GraphShape& shape) {
+    constexpr std::minstd_rand::result_type longest = 100;
+    std::minstd_rand draw(20260);
+    for (std::size_t node = 1, left = draw() % longest; node < shape.count; ++node) {
+        if (left > 0) {
+            shape.edges.emplace_back(node - 1, node);
+            --left;
+        } else {
+            left = draw() % longest;
+        }
+    }
+}
+
 }  // namespace
 
 GraphShape MakeShape(const std::string& kind, std::size_t count) {
@@ -33,6 +49,8 @@ GraphShape MakeShape(const std::string& kind, std::size_t count) {
         for (std::size_t node = 1; node < count; ++node) {
             shape.edges.emplace_back(node - 1, node);
         }
+    } else if (kind == "mixed") {
+        AddMixedChains(shape);
     } else if (kind != "independent") {
         throw std::invalid_argument("no such shape: " + kind);
     }

@@ -1,6 +1,6 @@
 /* A system log that throws everything away, so that a measured program logs at the price of a host
- * whose log daemon keeps up and runs on a processor of its own: as a batch job it does not
- * interrupt the program at each message where both share one (sched(7)). Usage: syslog-sink SOCKET
+ * whose log daemon keeps up. As a batch job it does not interrupt the program at each message where
+ * both share a processor (sched(7)). Usage: syslog-sink SOCKET
  */
 #define _GNU_SOURCE
 #include <sched.h>

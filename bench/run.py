@@ -42,13 +42,17 @@ def parse_arguments():
     parser.add_argument("--only", metavar="GROUP", nargs="+", choices=GROUPS, default=list(GROUPS),
                         help="of " + ", ".join(GROUPS))
     parser.add_argument("--rounds", metavar="N", type=int, help="7 unless given; 2 with --quick")
-    parser.add_argument("--output", metavar="DIR", default=str(CHECKOUT / "build/bench/report"),
-                        help="where the report goes; build/bench/report unless given")
+    parser.add_argument("--output", metavar="DIR",
+                        help="where the report goes; build/bench/report unless given, "
+                             "build/bench/report-quick with --quick")
     parser.add_argument("--update-docs", action="store_true",
                         help="put the figures into docs/performance.md too")
     arguments = parser.parse_args()
     if arguments.update_docs and arguments.only != list(GROUPS):
         parser.error("--update-docs takes a run of all groups")
+    if arguments.output is None:
+        report_name = "report-quick" if arguments.quick else "report"
+        arguments.output = str(CHECKOUT / "build/bench" / report_name)
     return arguments
 
 

@@ -14,7 +14,7 @@ from suite import graph  # noqa: E402
 from suite.command_graphs import CommandGraph  # noqa: E402
 from suite.host import one_benchmark  # noqa: E402
 from suite.instructions import collected  # noqa: E402
-from suite.makespan import random_plugins  # noqa: E402
+from suite.makespan import GRAPHS, random_plugins  # noqa: E402
 from suite.plot import svg  # noqa: E402
 from suite.report import summary  # noqa: E402
 from suite.results import BenchError, Curve, Results, Row  # noqa: E402
@@ -35,11 +35,6 @@ def test_the_highest_goes_first():
     assert makespan(chain_beside_two(), 3) == 10 + 20
 
 
-def test_workers_that_take_at_once_begin_with_what_is_requested_first():
-    # "alone" and "other" from 0 to 15, then the two of the chain one after the other.
-    assert makespan(chain_beside_two(), 2, at_once=True) == 15 + 10 + 20
-
-
 def test_a_barrier_waits_for_all_who_provide_it():
     plugins = [SleepingPlugin("quick", 1, provides=["b"]),
                SleepingPlugin("slow", 9, provides=["b"]), SleepingPlugin("last", 5, ["b"])]
@@ -51,13 +46,20 @@ def test_no_schedule_is_quicker_than_the_lower_bound():
     assert lower_bound(chain_beside_two(), 8) == 30
     assert lower_bound(chain_beside_two(), 1) == 60
     for seed in range(20):
-        plugins = random_plugins(seed, 100, 200000)
+        plugins = random_plugins(seed, 100, 200000, 8)
         assert lower_bound(plugins, 8) <= makespan(plugins, 8)
 
 
 def test_a_seed_gives_the_same_plugins_again():
-    assert random_plugins(3, 50, 200000) == random_plugins(3, 50, 200000)
-    assert random_plugins(3, 50, 200000) != random_plugins(4, 50, 200000)
+    assert random_plugins(3, 50, 200000, 8) == random_plugins(3, 50, 200000, 8)
+    assert random_plugins(3, 50, 200000, 8) != random_plugins(4, 50, 200000, 8)
+
+
+def test_the_longest_path_decides_in_the_last_random_graph_and_the_work_in_the_first():
+    for seed, path_decides in ((1, False), (4, True)):
+        plugins = random_plugins(seed, 200, 200000, GRAPHS[seed])
+        work = sum(plugin.microseconds for plugin in plugins) / 8
+        assert (lower_bound(plugins, 8) > work) is path_decides
 
 
 @pytest.mark.parametrize("shape, line", [
@@ -81,15 +83,6 @@ def test_a_ratio_is_the_median_over_the_rounds():
     assert row.verdict == "kept"
     row.limit = 1.9
     assert row.verdict == "missed"
-
-
-def test_what_is_to_stay_the_same_has_grown_only_when_chance_is_not_enough():
-    steady = Row("group", "work", "ours", 3, "us", "ours", 2, [1.0, 1.1, 1.1, 1.2], limit=1.0,
-                 growth=True)
-    assert steady.ratio > 1 and steady.verdict == "kept"
-    grown = Row("group", "work", "ours", 3, "us", "ours", 2, [1.01, 1.1, 1.1, 1.2], limit=1.0,
-                growth=True)
-    assert grown.verdict == "missed"
 
 
 def test_candidates_take_turns_in_turning_order():

@@ -6,6 +6,7 @@ from suite.results import Curve
 
 GROUP = "graph"
 SHAPES = ["independent", "layered", "chain"]
+MIXED = "chains of 1 to 100 nodes side by side"
 PROGRAMS = {"vantor": "vantor", "flow": "oneTBB"}
 LARGEST_AGAIN = 100000  # nodes of a graph that is also run again and again in one process
 FIRST_RUNS = {1000: 27, 10000: 9}  # a small graph is over soon: it is seen in so many processes
@@ -51,7 +52,7 @@ def _measure_shape(host, results, shape, counts):
         key: lambda key=key: _first_run(host, 1 if results.quick else FIRST_RUNS.get(key[2], 1),
                                         key[0], shape, key[2], key[1]) for key in keys})
     _compare(results, shape, counts, figures)
-    small, large = counts[-1] // 100 if counts[-1] // 100 in counts else counts[0], counts[-1]
+    small, large = _grown_sizes(counts)
     for workers in (1, 8):
         results.compare(GROUP, f"{shape}, {_workers(workers)}, from {small:,} to {large:,} nodes",
                         "ns/node", (f"vantor, {large:,}", figures["vantor", workers, large]),
@@ -69,7 +70,8 @@ def _measure_again(host, results, shape, counts):
     figures = results.alternate(f"{GROUP}: {shape}, again", {
         key: lambda key=key: _per_node(host, f"again/{key[0]}/{shape}", key[2], key[1])
         for key in keys})
-    _compare(results, shape, counts, figures, ", again and again", limited=False)
+    # For independent nodes oneTBB has its tasks' memory at hand, which no boot's first run finds.
+    _compare(results, shape, counts, figures, ", again and again", shape != "independent")
 
 
 def _compare(results, shape, counts, figures, what="", limited=True):
@@ -84,8 +86,39 @@ def _compare(results, shape, counts, figures, what="", limited=True):
                         figures["vantor", 1, count], 3.0 if limited else None)
 
 
+def _grown_sizes(counts):
+    """Two sizes a hundredfold apart, or as far as there are."""
+    return counts[-1] // 100 if counts[-1] // 100 in counts else counts[0], counts[-1]
+
+
 def _workers(count):
     return "1 worker" if count == 1 else f"{count} workers"
+
+
+def _measure_heights(host, results, counts):
+    """Chains of many lengths side by side: the queue has to order what is ready."""
+    sizes = _grown_sizes(counts)
+    figures = results.alternate(f"{GROUP}: mixed", {
+        (workers, count): lambda workers=workers, count=count:
+            _first_run(host, 1, "vantor", "mixed", count, workers)
+        for workers in (1, 8) for count in sizes})
+    for workers in (1, 8):
+        small, large = ((f"vantor, {count:,}", figures[workers, count]) for count in sizes)
+        results.compare(GROUP, f"{MIXED}, {_workers(workers)}, "
+                               f"from {sizes[0]:,} to {sizes[1]:,} nodes", "ns/node",
+                        large, small)
+
+
+def _measure_life(host, results, count):
+    """What the other rows leave out: to start and to join the executor's threads."""
+    processes = 1 if results.quick else FIRST_RUNS[count]
+    figures = results.alternate(f"{GROUP}: threads", {
+        workers: lambda workers=workers: statistics.median(
+            _per_node(host, "life/chain", count, workers) for _ in range(processes))
+        for workers in (1, 8)})
+    for workers, values in figures.items():
+        results.figure(GROUP, f"chain of {count:,} nodes, {_workers(workers)}, its threads started "
+                              "and joined too", "vantor", values, "ns/node")
 
 
 def _measure_long_chain(host, results, count):
@@ -105,6 +138,8 @@ def measure(host, results):
     for shape in SHAPES:
         _measure_shape(host, results, shape, counts)
         _measure_again(host, results, shape, [count for count in counts if count <= LARGEST_AGAIN])
+    _measure_heights(host, results, counts)
+    _measure_life(host, results, counts[0])
     _measure_long_chain(host, results, counts[-1])
 
 

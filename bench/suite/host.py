@@ -8,7 +8,7 @@ import subprocess
 from dataclasses import dataclass
 
 from harness.base_root import BaseRoot
-from harness.private_root import PLUGINS, PROFILING_LOG, PrivateRoot
+from harness.private_root import DEBUG_CONFIGURATION, PLUGINS, PROFILING_LOG, PrivateRoot
 
 from suite.results import BenchError
 
@@ -117,7 +117,7 @@ class Host:
         """An empty plugin directory and no debug configuration."""
         shutil.rmtree(self.root.path(PLUGINS))
         self.root.folder_at(PLUGINS)
-        self.root.debug_configuration()
+        self.root.remove(DEBUG_CONFIGURATION)
 
     def plugin_spans(self):
         """Name, start and end of every plugin of the last boot, in microseconds of its day."""

@@ -8,7 +8,7 @@ import subprocess
 
 from harness.private_root import PLUGINS
 
-from suite.graph import only
+from suite.graph import MIXED, only
 from suite.host import VANTOR
 from suite.loading import lay_out_plugins, write_documents
 from suite.results import BenchError
@@ -51,6 +51,10 @@ def _graph(host, results, count):
                         for program in ("vantor", "flow"))
         results.compare(GROUP, f"{count:,} empty nodes, {shape}, 1 worker", "per node",
                         ("vantor", ours), ("oneTBB", theirs))
+    results.progress.say(f"{GROUP}: {MIXED}")
+    large, small = ((f"vantor, {size:,}", [_count_graph(host, "boot/vantor/mixed", size, 1)])
+                    for size in (10 * count, count))
+    results.compare(GROUP, f"{MIXED}, 1 worker", "per node", large, small, 1.01)
     for what, name in (("requested from its first node", "schedule/near"),
                        ("requested from its last node", "schedule/far"),
                        ("height of its first node", "height")):

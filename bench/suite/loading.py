@@ -45,7 +45,7 @@ def measure(host, results):
         candidates = {"vantor": lambda count=count: _boot(host, count),
                       loop: lambda count=count: _loop(host, count),
                       duties: lambda count=count: _loop(host, count, "duties")}
-        # A run of a thousand takes a tenth of a second, as long as one other process disturbs it.
+        # A run of a thousand takes but a tenth of a second: another process may disturb all of it.
         figures = results.alternate(f"loading: {count:,} native plugins", candidates,
                                     often=dict.fromkeys(candidates, counts[-1] // count))
         # A process of its own costs more than a hundred plugins: only the others say what one does.

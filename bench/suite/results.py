@@ -16,8 +16,6 @@ class Row:
 
     ratios  ours divided by the other, one for each round
     limit   what the ratio is to stay at or below; None where nothing is asked
-    growth  both figures are ours, at two sizes, and are to be the same: equal ones differ by chance,
-            so that only a ratio beyond the limit in every round is a growth
     """
 
     group: str
@@ -29,7 +27,6 @@ class Row:
     reference_value: float = 0.0
     ratios: list = field(default_factory=list)
     limit: float = None
-    growth: bool = False
 
     @property
     def ratio(self):
@@ -46,8 +43,7 @@ class Row:
     def verdict(self):
         if self.limit is None or not self.ratios:
             return ""
-        counts = min(self.ratios) if self.growth else self.ratio
-        return "kept" if counts <= self.limit else "missed"
+        return "kept" if self.ratio <= self.limit else "missed"
 
 
 @dataclass
@@ -121,8 +117,8 @@ class Results:
         """Reports a figure that is compared with nothing."""
         self.rows.append(Row(group, work, subject, statistics.median(values), unit))
 
-    def compare(self, group, work, unit, ours, theirs, limit=None, growth=False):
+    def compare(self, group, work, unit, ours, theirs, limit=None):
         """Reports a pair. `ours` and `theirs` are (name, figures of the same rounds)."""
         ratios = [one / other for one, other in zip(ours[1], theirs[1])]
         self.rows.append(Row(group, work, ours[0], statistics.median(ours[1]), unit, theirs[0],
-                             statistics.median(theirs[1]), ratios, limit, growth))
+                             statistics.median(theirs[1]), ratios, limit))

@@ -58,11 +58,10 @@ def lower_bound(plugins, workers):
     return max(max(graph.length.values()), sum(graph.time.values()) / workers)
 
 
-def makespan(plugins, workers, at_once=False):
+def makespan(plugins, workers):
     """Microseconds from the first start to the last end; `plugins` in the order of their loading.
 
-    All plugins are requested, with what they wait for, before a worker looks at any; or, `at_once`,
-    idle workers take each node as soon as it is requested, before higher ones are.
+    All plugins are requested, with what they wait for, before a worker looks at any.
     """
     graph = _Graph(plugins)
     left = {node: len(others) for node, others in graph.waits_for.items()}
@@ -82,8 +81,6 @@ def makespan(plugins, workers, at_once=False):
     for node in _in_order_of_request(graph, [plugin.name for plugin in plugins]):
         if left[node] == 0:
             becomes_ready(node)
-            if at_once:
-                take()
     take()
     while running:
         now, _, done = heapq.heappop(running)

@@ -1,7 +1,6 @@
 #include "driver/DebugConfig.h"
 
 #include <fcntl.h>
-#include <sys/stat.h>
 #include <syslog.h>
 #include <unistd.h>
 
@@ -26,18 +25,9 @@ constexpr char listSeparator = ',';
 constexpr const char* quoteCharacters = "\"'";
 constexpr const char* special = "\\\"'";  // the escape character and the quote characters
 
-// One system call where there is nothing to read, which would take three to find.
-bool IsEmptyOrMissing(const char* path) {
-    struct stat status {};
-    return stat(path, &status) != 0 || (S_ISREG(status.st_mode) && status.st_size == 0);
-}
-
 // Empty when the file cannot be read to its end: a command that is cut off is not to be run.
 std::string ContentOf(const char* path) {
     std::string content;
-    if (IsEmptyOrMissing(path)) {
-        return content;
-    }
     const FileDescriptor file(open(path, O_RDONLY | O_CLOEXEC));
     if (!file.IsOpen()) {
         return content;

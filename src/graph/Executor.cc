@@ -98,15 +98,7 @@ void* Executor::WorkerEntry(void* argument) {
 void Executor::RunWorker() {
     GlobalLockGuard guard;
     while (!stopping) {
-        while (HasReady()) {
-            TakeNext().Execute(*this, guard);
-            if (stopping) {
-                return;
-            }
-            if (wakeUpOwed) {
-                nodesComeSoon = Clock::now() - lastFellAsleep < soon;
-            }
-        }
+        RunReadyNodes(guard);
         LookOutForNodes(guard);
         if (!HasReady() && !stopping) {
             lastFellAsleep = Clock::now();
@@ -114,6 +106,22 @@ void Executor::RunWorker() {
             GlobalLock::Wait(workAvailable);
         }
     }
+}
+
+// Until none is ready, or the pool stops. Whoever was busy for long is not to look out for more: on
+// a machine with other work to do, giving way takes milliseconds.
+void Executor::RunReadyNodes(GlobalLockGuard& guard) {
+    if (!HasReady()) {
+        return;
+    }
+    const auto begin = Clock::now();
+    while (HasReady() && !stopping) {
+        TakeNext().Execute(*this, guard);
+        if (wakeUpOwed) {
+            nodesComeSoon = Clock::now() - lastFellAsleep < soon;
+        }
+    }
+    nodesComeSoon = nodesComeSoon && Clock::now() - begin < soon;
 }
 
 // A worker that has just been started looks here for what is requested at that moment, and so need

@@ -63,6 +63,7 @@ private:
 
     static void* WorkerEntry(void* argument);
     void RunWorker();
+    void RunReadyNodes(GlobalLockGuard& guard);
     void LookOutForNodes(GlobalLockGuard& guard);
     void StartWorkers(std::int32_t threadCount);
     void StopWorkers();
@@ -81,7 +82,8 @@ private:
     Clock::time_point lastFellAsleep;  // when a worker went to sleep last
     // Whether the last node for which a worker had to wake others came soon after one of them had
     // gone to sleep. How long those take to wake does not count: that may be many times as long.
-    // Nodes are taken to come soon until one has not: the first ones follow the construction.
+    // Nodes are taken to come soon until one has not, as the first ones follow the construction, or
+    // a worker has been busy for long.
     bool nodesComeSoon = true;
     bool randomize;
 };

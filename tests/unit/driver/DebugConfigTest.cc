@@ -1,18 +1,13 @@
 #include "driver/DebugConfig.h"
 
-#include <fcntl.h>
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
-#include <sys/stat.h>
 #include <syslog.h>
 #include <unistd.h>
 
 #include <cerrno>
-#include <fstream>
 #include <sstream>
-#include <thread>
 
-#include "io/FileDescriptor.h"
 #include "support/FaultPoint.h"
 #include "support/PrivateRoot.h"
 #include "support/SyslogCapture.h"
@@ -248,29 +243,6 @@ TEST_F(DebugConfigTest, AMissingFileIsEmptyAndSilent) {
     const support::PrivateRoot root;
     EXPECT_THAT(ReadDebugConfig(), IsEmpty());
     EXPECT_THAT(log.Entries(), IsEmpty());
-}
-
-// Hosts that inject nothing: it is asked for once for each plugin file.
-TEST_F(DebugConfigTest, AFileWithoutContentIsNotRead) {
-    const support::PrivateRoot root;
-    root.Write("/etc/nuvex/vantor/debug.conf", "");
-    ReadFault().FailCall(1, EIO);
-    EXPECT_THAT(ReadDebugConfig(), IsEmpty());
-    EXPECT_EQ(ReadFault().Calls(), 0);
-    ReadFault().Reset();
-}
-
-// The size of a pipe says nothing about what comes out of it.
-TEST_F(DebugConfigTest, APipeIsReadToItsEnd) {
-    const support::PrivateRoot root;
-    root.MakeFolder("/etc/nuvex/vantor");
-    const std::string path = root.Path("/etc/nuvex/vantor/debug.conf");
-    ASSERT_EQ(mkfifo(path.c_str(), 0600), 0);
-    std::thread writer([&path] { std::ofstream(path) << "x:a:b:c\n"; });
-    EXPECT_THAT(ReadDebugConfig(), ElementsAre(Entry("x", {"a"}, {"b"}, "c")));
-    // A writer that nobody has listened to would wait for ever.
-    const FileDescriptor listener(open(path.c_str(), O_RDONLY | O_NONBLOCK));
-    writer.join();
 }
 
 TEST_F(DebugConfigTest, AnUnreadableFileIsEmptyAndSilent) {

@@ -126,6 +126,33 @@ TEST_F(WakeUpTest, SingleWorkerGivesWayBeforeItSleepsForTheFirstTime) {
     EXPECT_GT(yields, 0);
 }
 
+// How often the only worker gives way between the end of its only node and its next sleep.
+int YieldsAfterANodeOf(std::chrono::microseconds time) {
+    GraphText graph({"a"});
+    std::atomic<int> yields{0};
+    graph["a"].onRun = [&] {
+        if (time.count() > 0) {
+            std::this_thread::sleep_for(time);
+        }
+        yields = Faults().yield.Calls();
+    };
+    const int sleeps = Faults().condWait.Calls();
+    Executor executor(1, false);
+    EXPECT_TRUE(WaitUntil([&] { return Faults().condWait.Calls() == sleeps + 1; }));
+    graph.Schedule(executor);
+    EXPECT_TRUE(WaitUntil([&] { return Faults().condWait.Calls() == sleeps + 2; }));
+    return Faults().yield.Calls() - yields;
+}
+
+TEST_F(WakeUpTest, SingleWorkerSleepsAtOnceAfterLongWork) {
+    EXPECT_EQ(YieldsAfterANodeOf(std::chrono::milliseconds(1)), 0);
+}
+
+// How long the node takes is for the machine to say: it is tried until it was short enough.
+TEST_F(WakeUpTest, SingleWorkerGivesWayAgainAfterShortWork) {
+    EXPECT_TRUE(WaitUntil([] { return YieldsAfterANodeOf({}) > 0; }));
+}
+
 TEST_F(WakeUpTest, PluginDoesNotFindSigchldBlockedByTheSleepBefore) {
     GraphText graph({"a"});
     int isBlocked = -1;

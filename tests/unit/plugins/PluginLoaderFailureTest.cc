@@ -33,10 +33,10 @@ protected:
         EXPECT_THAT(plugins, IsEmpty());
     }
 
-    // There is no debug configuration: nothing is opened before the plugin's own file.
+    // The debug configuration is what is opened before the plugin's own file.
     static void BeforeTheObjectIsOpened(const std::function<void()>& action) {
         support::OpenFault().Before([action] {
-            if (support::OpenFault().Calls() == 1) {
+            if (support::OpenFault().Calls() == 2) {
                 action();
             }
         });
