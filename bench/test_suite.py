@@ -85,6 +85,21 @@ def test_a_ratio_is_the_median_over_the_rounds():
     assert row.verdict == "missed"
 
 
+def growth_row(*ratios):
+    return Row("group", "work", "ours", 3, "us", "ours", 2, list(ratios), limit=1.0, growth=True)
+
+
+def test_what_is_to_stay_the_same_has_grown_only_when_chance_is_not_enough():
+    assert growth_row(1.06, 0.99, 1.02, 1.07, 1.15, 1.07, 0.97).verdict == "kept"
+    assert growth_row(1.06, 1.02).verdict == "kept"
+    assert growth_row(1.2).verdict == "kept"
+
+
+def test_a_small_growth_in_quiet_rounds_and_a_large_one_in_others_is_one():
+    assert growth_row(1.02, 1.02, 1.01, 1.02, 1.03, 1.02, 1.01).verdict == "missed"
+    assert growth_row(1.20, 1.18, 1.22, 1.15, 1.19, 1.21, 0.99).verdict == "missed"
+
+
 def test_candidates_take_turns_in_turning_order():
     order = []
     results = Results(rounds=2, quick=True)

@@ -35,7 +35,8 @@ def _row(row):
         return f"| {row.work} | {row.subject} {ours} | | | | |"
     low, high = row.quartiles
     spread = f"{low:.2f} to {high:.2f}" if len(row.ratios) > 1 else ""
-    limit = f"{row.limit:g} {row.verdict}" if row.verdict else ""
+    limit = f"no growth beyond chance: {row.verdict}" if row.growth else \
+        f"{row.limit:g} {row.verdict}" if row.verdict else ""
     cells = [row.work, f"{row.subject} {ours}", f"{row.reference} {figure(row.reference_value)}",
              f"{row.ratio:.2f}", spread, limit]
     return "| " + " | ".join(cells).rstrip() + " |"

@@ -1,5 +1,6 @@
 """What was measured: rows of a table and curves, and the way in which pairs are measured."""
 
+import math
 import statistics
 import sys
 import time
@@ -10,12 +11,21 @@ class BenchError(Exception):
     """A measured program that failed, or did not do what it was measured for."""
 
 
+def _least_mean(values):
+    """Three standard errors below the mean; 0 of a single value, which tells nothing."""
+    if len(values) < 2:
+        return 0.0
+    return statistics.mean(values) - 3 * statistics.stdev(values) / math.sqrt(len(values))
+
+
 @dataclass
 class Row:
     """A figure of ours, with the figure it is compared with if there is one.
 
     ratios  ours divided by the other, one for each round
     limit   what the ratio is to stay at or below; None where nothing is asked
+    growth  both figures are ours, at two sizes, and are to be the same: equal ones differ by chance,
+            so that only a mean three standard errors beyond the limit is a growth
     """
 
     group: str
@@ -27,6 +37,7 @@ class Row:
     reference_value: float = 0.0
     ratios: list = field(default_factory=list)
     limit: float = None
+    growth: bool = False
 
     @property
     def ratio(self):
@@ -43,7 +54,8 @@ class Row:
     def verdict(self):
         if self.limit is None or not self.ratios:
             return ""
-        return "kept" if self.ratio <= self.limit else "missed"
+        least = _least_mean(self.ratios) if self.growth else self.ratio
+        return "kept" if least <= self.limit else "missed"
 
 
 @dataclass
@@ -117,8 +129,8 @@ class Results:
         """Reports a figure that is compared with nothing."""
         self.rows.append(Row(group, work, subject, statistics.median(values), unit))
 
-    def compare(self, group, work, unit, ours, theirs, limit=None):
+    def compare(self, group, work, unit, ours, theirs, limit=None, growth=False):
         """Reports a pair. `ours` and `theirs` are (name, figures of the same rounds)."""
         ratios = [one / other for one, other in zip(ours[1], theirs[1])]
         self.rows.append(Row(group, work, ours[0], statistics.median(ours[1]), unit, theirs[0],
-                             statistics.median(theirs[1]), ratios, limit))
+                             statistics.median(theirs[1]), ratios, limit, growth))
