@@ -13,8 +13,8 @@ from suite.simulation import SleepingPlugin
 
 WORKERS = 8
 # Seed of a graph -> how many levels a step of it takes: in the first the work decides, and in the
-# last the longest path does; in all but the first a worker that took plugins in any other order
-# would be later by a fourteenth at least.
+# last the longest path does. In all but the first, plugins that were taken in the order in which they
+# become ready would end a twentieth later at least.
 GRAPHS = {1: 8, 2: 4, 3: 3, 4: 2}
 STAMP, ROOM = b"VANTOR BENCH SLEEPING PLUGIN", 1024
 
