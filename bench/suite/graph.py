@@ -34,7 +34,7 @@ def _first_run(host, processes, program, shape, count, workers):
 
 
 def _check(host, count):
-    for shape in SHAPES:
+    for shape in [*SHAPES, "mixed"]:
         for program in PROGRAMS:
             for workers in (1, 8):
                 _per_node(host, f"check/{program}/{shape}", count, workers)
